@@ -1,0 +1,20 @@
+# Language level, warnings and sanitizers: the same for every target of the build.
+set(CMAKE_CXX_STANDARD 20)
+set(CMAKE_CXX_STANDARD_REQUIRED ON)
+set(CMAKE_CXX_EXTENSIONS OFF)
+set(CMAKE_EXPORT_COMPILE_COMMANDS ON)
+set(CMAKE_RUNTIME_OUTPUT_DIRECTORY ${CMAKE_BINARY_DIR}/bin)
+
+add_compile_options(-Wall -Wextra -Wpedantic -Wshadow -Wconversion -Wsign-conversion -Wnon-virtual-dtor
+                    -Wold-style-cast -Woverloaded-virtual -Werror)
+# The PPD interface of libcups is marked deprecated and has no successor in libcups 2.
+add_compile_options(-Wno-deprecated-declarations)
+
+if(VENTRAS_SANITIZER)
+  add_compile_options(-fsanitize=${VENTRAS_SANITIZER} -fno-omit-frame-pointer -fno-sanitize-recover=all)
+  add_link_options(-fsanitize=${VENTRAS_SANITIZER})
+endif()
+if(VENTRAS_FUZZ)
+  # Coverage for the code under test; each fuzz target adds the driver's main().
+  add_compile_options(-fsanitize=fuzzer-no-link)
+endif()

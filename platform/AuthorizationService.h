@@ -1,0 +1,18 @@
+#pragma once
+
+#include <cstdint>
+#include <string_view>
+
+namespace ventras {
+
+/// Decides whether this process may administer printers.
+class AuthorizationService {
+public:
+    virtual ~AuthorizationService() = default;
+
+    /// Asks for one right by name, e.g. "system.print.admin"; may ask the user.
+    /// @return 0 when granted, else the platform's status, fit to be an exit status.
+    virtual std::int32_t create(std::string_view right) = 0;
+};
+
+}  // namespace ventras
