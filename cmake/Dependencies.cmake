@@ -5,7 +5,9 @@ find_package(Threads REQUIRED)
 pkg_check_modules(GIO REQUIRED IMPORTED_TARGET gio-2.0 gio-unix-2.0)
 pkg_check_modules(PLIST REQUIRED IMPORTED_TARGET libplist-2.0)
 pkg_check_modules(CUPSFILTERS REQUIRED IMPORTED_TARGET libcupsfilters)
+pkg_check_modules(LIBUSB REQUIRED IMPORTED_TARGET libusb-1.0)
 pkg_check_modules(DNSSD REQUIRED IMPORTED_TARGET avahi-compat-libdns_sd)
+pkg_check_modules(AVAHI REQUIRED IMPORTED_TARGET avahi-client)
 find_package(nlohmann_json REQUIRED)
 
 # Debian's libcups2-dev has cups-config but no pkg-config file.

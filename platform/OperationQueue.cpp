@@ -8,6 +8,7 @@ namespace ventras {
 OperationQueue::~OperationQueue() {
     {
         const std::lock_guard lock(mutex_);
+        ending_ = true;
         waiting_.clear();
         ready_.clear();
     }
@@ -17,6 +18,8 @@ OperationQueue::~OperationQueue() {
 
 void OperationQueue::addOperation(std::shared_ptr<Operation> operation) {
     const std::lock_guard lock(mutex_);
+    if (ending_)
+        return;
     waiting_.push_back(std::move(operation));
     promoteReadyOperations();
 }

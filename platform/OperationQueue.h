@@ -29,7 +29,8 @@ public:
     /// Waits for the operations that are running; drops those that have not begun.
     ~OperationQueue();
 
-    /// Queues an operation. A dependency that is never queued keeps it waiting for ever.
+    /// Queues an operation. A dependency that is never queued keeps it waiting for ever; an operation that a
+    /// running one adds while the queue is being destroyed is dropped.
     void addOperation(std::shared_ptr<Operation> operation);
 
 private:
@@ -44,6 +45,7 @@ private:
     std::deque<std::shared_ptr<Operation>> ready_;
     std::set<std::weak_ptr<Operation>, std::owner_less<>> finished_;
     std::size_t idleWorkers_ = 0;
+    bool ending_ = false;
     std::vector<std::jthread> workers_;
 };
 

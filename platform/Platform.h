@@ -18,6 +18,7 @@ class ProcessTable;
 class ResourceBundle;
 class RunLoop;
 class StringTable;
+class UsbRegistry;
 
 /// Everything that the agent needs from the world. It owns nothing; what it names outlives whoever holds it.
 struct Platform {
@@ -33,6 +34,7 @@ struct Platform {
     NotificationBroadcast& notifications;
     PrintToolAgentChannel& printToolAgent;
     PredicateInstallController& installer;
+    UsbRegistry& usb;
     std::function<std::unique_ptr<ImageDeviceBrowser>()> makeImageDeviceBrowser;
 };
 

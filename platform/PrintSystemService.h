@@ -82,6 +82,10 @@ public:
     virtual bool isFax(const std::string& queueID) = 0;
     virtual bool isScanner(const std::string& queueID) = 0;
 
+    /// Copies an existing queue's PPD. @return path of a new temporary file that the caller deletes; absent when
+    /// the queue has none, or the scheduler does not hand it out.
+    virtual std::optional<std::string> copyQueuePPD(const std::string& queueID) = 0;
+
     /// Installs a PPD file as an existing queue's driver. @return 0 on success.
     virtual std::int32_t setQueuePPD(const std::string& queueID, const std::string& ppdPath) = 0;
 

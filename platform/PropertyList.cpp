@@ -4,7 +4,6 @@
 
 #include <algorithm>
 #include <cstdlib>
-#include <limits>
 #include <memory>
 #include <type_traits>
 
@@ -13,11 +12,17 @@
 namespace ventras {
 namespace {
 
-using PlistPtr = std::unique_ptr<std::remove_pointer_t<plist_t>, decltype([](plist_t node) { plist_free(node); })>;
+using PlistPtr =
+    std::unique_ptr<std::remove_pointer_t<plist_t>, decltype([](plist_t node) { plist_free(node); })>;
 using PlistText = std::unique_ptr<char, decltype([](char* text) { std::free(text); })>;
 
-// Deeper nesting than this comes from no one who means well, and libplist and we recurse.
+// Deeper nesting than this comes from no one who means well.
 constexpr int kDeepest = 64;
+
+// libplist recurses as deep as the data nests, before we see any of it; these sizes cannot nest deep enough
+// to exhaust a stack.
+constexpr std::size_t kLongestXml = 512 * 1024;
+constexpr std::size_t kLongestBinary = 128 * 1024;
 
 bool fitsXml(std::string_view text) {
     const auto isForbidden = [](char c) {
@@ -28,7 +33,9 @@ bool fitsXml(std::string_view text) {
 
 struct Builder {
     plist_t operator()(bool flag) const { return plist_new_bool(flag ? 1 : 0); }
-    plist_t operator()(std::int64_t number) const { return plist_new_uint(static_cast<std::uint64_t>(number)); }
+    plist_t operator()(std::int64_t number) const {
+        return plist_new_uint(static_cast<std::uint64_t>(number));
+    }
     plist_t operator()(const std::string& text) const {
         return fitsXml(text) ? plist_new_string(text.c_str()) : nullptr;
     }
@@ -126,10 +133,13 @@ std::optional<std::string> xmlPropertyList(const PropertyValue& value) {
 }
 
 std::optional<PropertyValue> parsePropertyList(std::string_view data) {
-    if (data.size() > std::numeric_limits<std::uint32_t>::max())
+    const bool isBinary = data.size() < kLongestBinary &&
+                          plist_is_binary(data.data(), static_cast<std::uint32_t>(data.size())) != 0;
+    if (!isBinary && data.size() > kLongestXml)
         return std::nullopt;
     plist_t node = nullptr;
-    plist_from_memory(data.data(), static_cast<std::uint32_t>(data.size()), &node);
+    const auto parse = isBinary ? plist_from_bin : plist_from_xml;
+    parse(data.data(), static_cast<std::uint32_t>(data.size()), &node);
     const PlistPtr root{node};
     return root ? read(root.get(), 0) : std::nullopt;
 }

@@ -7,7 +7,10 @@
 
 namespace ventras {
 
+// Shared, because the waiting thread goes on while release() may not yet have returned on the main thread.
 struct RunLoop::Task {
+    explicit Task(const std::function<void()>& work) : function(work) {}
+
     const std::function<void()>& function;
     std::binary_semaphore done{0};
 };
@@ -46,23 +49,23 @@ void RunLoop::performOnMainThread(const std::function<void()>& function) {
         function();
         return;
     }
-    Task task{function};
+    const auto task = std::make_shared<Task>(function);
     {
         const std::lock_guard lock(mutex_);
-        tasks_.push_back(&task);
+        tasks_.push_back(task);
     }
     g_main_context_wakeup(context_);
-    task.done.acquire();
+    task->done.acquire();
 }
 
 void RunLoop::runWaitingTasks() {
     for (;;) {
-        Task* task = nullptr;
+        std::shared_ptr<Task> task;
         {
             const std::lock_guard lock(mutex_);
             if (tasks_.empty())
                 return;
-            task = tasks_.front();
+            task = std::move(tasks_.front());
             tasks_.pop_front();
         }
         task->function();

@@ -3,6 +3,7 @@
 #include <atomic>
 #include <deque>
 #include <functional>
+#include <memory>
 #include <mutex>
 #include <thread>
 
@@ -38,7 +39,7 @@ private:
     std::thread::id mainThread_;
     std::atomic<bool> stopped_ = false;
     std::mutex mutex_;
-    std::deque<Task*> tasks_;
+    std::deque<std::shared_ptr<Task>> tasks_;
 };
 
 }  // namespace ventras
