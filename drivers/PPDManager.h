@@ -1,32 +1,22 @@
 #pragma once
 
-#include <cstdint>
-#include <map>
-#include <mutex>
 #include <optional>
-#include <stdexcept>
 #include <string>
 #include <string_view>
 #include <vector>
 
+#include "drivers/GenericDrivers.h"
 #include "drivers/PPDRecord.h"
+#include "drivers/TextEncoding.h"
 #include "platform/Handles.h"
 
 namespace ventras {
 
 struct Platform;
 
-/// How the free-text values of a PPD are encoded.
-enum class TextEncoding { UTF8, ISOLatin1, WindowsCP1252, ShiftJIS };
-
-/// A generic driver that the print system should hold is missing or broken; nothing catches it.
-class InternalInconsistencyError : public std::logic_error {
-public:
-    using std::logic_error::logic_error;
-};
-
-/// Knows the drivers: reads and ranks PPDs, asks the local scheduler for its catalogue, finds the drivers that
-/// fit a device, and holds the generic ones. Any thread may call.
+/// Knows the drivers: reads and ranks PPDs, asks the local scheduler for its catalogue, finds the drivers
+/// that fit a device, and holds the generic ones. Each of these has its own file; this is their one face. Any
+/// thread may call.
 class PPDManager {
 public:
     using Records = std::vector<PPDRecord>;
@@ -36,7 +26,8 @@ public:
     /// The process's shared manager, made at the first call and kept; later calls give the same one.
     static PPDManager& defaultManager(Platform& platform);
 
-    // PPD files and records (Adobe PPD 4.3) ------------------------------------------------------------------
+    // PPD files and records (Adobe PPD 4.3)
+    // ------------------------------------------------------------------
 
     /// Reads a PPD file, compressed or not. @return absent when libcups cannot open it as a PPD.
     static std::optional<PPDRecord> parsePPD(const std::string& path);
@@ -61,18 +52,21 @@ public:
     /// A copy of its argument.
     static std::string localizedPPD(const std::string& ppd);
 
-    // The scheduler's catalogue ------------------------------------------------------------------------------
+    // The scheduler's catalogue
+    // ------------------------------------------------------------------------------
 
     /// The catalogue, asked for anew, in the scheduler's order; empty when it does not answer.
     Records ppds() const;
 
-    /// Copies a local PPD, decompressed. @return path of a new temporary file that the caller deletes, or absent.
+    /// Copies a local PPD, decompressed. @return path of a new temporary file that the caller deletes, or
+    /// absent.
     std::optional<std::string> ppdFileWithName(const std::optional<std::string>& path) const;
 
     /// Fetches a driver's PPD. @return path of a new temporary file that the caller deletes, or absent.
     std::optional<std::string> ppdFile(const PPDRecord& record) const;
 
-    // Drivers for a device -----------------------------------------------------------------------------------
+    // Drivers for a device
+    // -----------------------------------------------------------------------------------
 
     using Text = std::optional<std::string>;
 
@@ -91,7 +85,8 @@ public:
     std::optional<Records> rasterPPDs() const;
     std::optional<Records> postscriptPPDs() const;
 
-    // Generic drivers ----------------------------------------------------------------------------------------
+    // Generic drivers
+    // ----------------------------------------------------------------------------------------
 
     /// Copies of the generic records, each looked up once in this manager's life.
     PPDRecord genericPostscriptPPD();
@@ -103,18 +98,16 @@ public:
     /// @throws InternalInconsistencyError when it is missing or does not parse: a broken installation.
     PPDRecord genericSystemPPD(std::string_view name) const;
 
-    // Drivers that could be installed ------------------------------------------------------------------------
+    // Drivers that could be installed
+    // ------------------------------------------------------------------------
 
     /// The one driver package for a device; absent when there is none, or more than one.
     std::optional<PPDRecord> softwareUpdateDriverFor(const Text& deviceID, bool vellum) const;
     std::optional<PPDRecord> softwareUpdateForPPD(ppd_file_t* ppd) const;
 
 private:
-    PPDRecord cachedGeneric(std::string_view key, PPDRecord (PPDManager::*find)() const);
-
     Platform& platform_;
-    std::mutex genericsMutex_;
-    std::map<std::string, PPDRecord, std::less<>> generics_;
+    GenericDrivers generics_;
 };
 
 }  // namespace ventras
