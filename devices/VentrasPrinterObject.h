@@ -45,6 +45,9 @@ public:
     /// The drivers that fit, in the catalogue's order.
     virtual std::optional<std::vector<PPDRecord>> driverList() { return std::nullopt; }
 
+    /// Why the device cannot be served, in words for the log; absent when nothing is known to be wrong with it.
+    virtual std::optional<std::string> difficulty() { return std::nullopt; }
+
     /// Name of the queue that was made for this device, or found to serve it.
     std::optional<std::string> queueID() const;
     void setQueueID(std::optional<std::string> queueID);
