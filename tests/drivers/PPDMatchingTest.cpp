@@ -8,6 +8,7 @@
 #include <sstream>
 
 #include "bench/NaiveMatching.h"
+#include "deviceid/PMStringAdditions.h"
 #include "drivers/PPDManager.h"
 
 namespace ventras {
@@ -20,28 +21,28 @@ using Reason = std::optional<MatchReason>;
 
 constexpr auto kNone = std::nullopt;
 
+template <typename Value>
+PPDRecord recordWith(Value PPDRecord::*field, Value value) {
+    PPDRecord record;
+    record.*field = std::move(value);
+    return record;
+}
+
 PPDRecord productRecord(std::vector<std::string> products) {
-    PPDRecord record;
-    record.product = std::move(products);
-    return record;
+    return recordWith(&PPDRecord::product, std::move(products));
 }
 
-PPDRecord idRecord(std::string deviceID) {
-    PPDRecord record;
-    record.deviceID = std::move(deviceID);
-    return record;
+PPDRecord idRecord(const std::string& deviceID) {
+    return recordWith(&PPDRecord::deviceID, Text(deviceID));
 }
 
-PPDRecord nameRecord(std::string makeAndModel, std::string name = "drv:///a.drv/a.ppd") {
-    PPDRecord record;
-    record.name = std::move(name);
-    record.makeAndModel = std::move(makeAndModel);
-    return record;
+PPDRecord numberRecord(const std::string& modelNumber) {
+    return recordWith(&PPDRecord::modelNumber, Text(modelNumber));
 }
 
-PPDRecord numberRecord(std::string modelNumber) {
-    PPDRecord record;
-    record.modelNumber = std::move(modelNumber);
+PPDRecord nameRecord(const std::string& makeAndModel, const std::string& name = "drv:///a.drv/a.ppd") {
+    auto record = recordWith(&PPDRecord::makeAndModel, Text(makeAndModel));
+    record.name = name;
     return record;
 }
 
@@ -342,6 +343,16 @@ public:
         return record;
     }
 
+    /// Says of itself what one of the drivers says, or something else.
+    std::array<Text, 3> device(const std::vector<PPDRecord>& list) {
+        const auto& kin = list[pick(list.size())];
+        if (kin.deviceID && chance(3))
+            return {kNone, kNone, PMStringAdditions::product(*kin.deviceID)};
+        if (kin.deviceID && chance(3))
+            return {kNone, PMStringAdditions::model(*kin.deviceID), kNone};
+        return {maybe(deviceID()), maybe(words()), maybe(product())};
+    }
+
     std::vector<PPDRecord> records(int count) {
         std::vector<PPDRecord> list;
         for (int i = 0; i < count; ++i)
@@ -386,9 +397,7 @@ TEST(DriverMatch, AgreesWithThePlainWayOnRandomCatalogues) {
         RandomCatalogue random(seed);
         const auto list = random.records(100);
         for (int device = 0; device < 10; ++device) {
-            const auto deviceID = random.maybe(random.deviceID());
-            const auto model = random.maybe(random.words());
-            const auto product = random.maybe(random.product());
+            const auto& [deviceID, model, product] = random.device(list);
             std::vector<std::size_t> found;
             for (const auto& match : matchingDrivers(DeviceToMatch(deviceID, model, product), list))
                 found.push_back(match.index);

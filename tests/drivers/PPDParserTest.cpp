@@ -226,7 +226,7 @@ TEST_F(PPDFile, DecodesItsNamesByItsLanguageEncoding) {
         {"None", "プリンタ", "プリンタ"},
     };
     for (const auto& [encoding, bytes, expected] : cases) {
-        const auto named = [&](const char* keyword) {
+        const auto named = [&bytes = bytes](const char* keyword) {
             return std::string("*") + keyword + ": \"" + bytes + " x\"";
         };
         const auto record = parsed({"*LanguageEncoding: " + encoding, named("NickName"),
