@@ -8,6 +8,7 @@ pkg_check_modules(CUPSFILTERS REQUIRED IMPORTED_TARGET libcupsfilters)
 pkg_check_modules(LIBUSB REQUIRED IMPORTED_TARGET libusb-1.0)
 pkg_check_modules(DNSSD REQUIRED IMPORTED_TARGET avahi-compat-libdns_sd)
 pkg_check_modules(AVAHI REQUIRED IMPORTED_TARGET avahi-client)
+pkg_check_modules(UDEV REQUIRED IMPORTED_TARGET libudev)
 find_package(nlohmann_json REQUIRED)
 
 # Debian's libcups2-dev has cups-config but no pkg-config file.

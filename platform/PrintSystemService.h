@@ -21,7 +21,7 @@ inline constexpr std::int32_t kNoPermission = 77;  ///< the scheduler does not l
 
 /// What auto-selection learnt about a device.
 struct AutoSelectInfo {
-    std::optional<std::string> product;  ///< the device's own product text, e.g. a PostScript product string
+    std::optional<std::string> product{};  ///< the device's own product text, e.g. a PostScript product string
     bool isBinaryOK = false;             ///< whether the channel takes binary data
 };
 

@@ -7,12 +7,8 @@
 #include <vector>
 
 #include "devices/VellumProfilePrinterObject.h"
-#include "drivers/PPDManager.h"
-#include "tests/fakes/FakePlatform.h"
 #include "tests/fakes/PropertyValuePrinter.h"
-#include "tests/parts/PrivateScheduler.h"
-#include "tests/queues/OwnTemporaryFiles.h"
-#include "tests/queues/ScriptedScheduler.h"
+#include "tests/queues/QueueMaking.h"
 
 namespace ventras {
 namespace {
@@ -23,43 +19,15 @@ constexpr std::string_view kURI = "ipp://printer.local/ipp/print";
 const DeviceDescription kDriverless{
     {"display-name", "Office"}, {"URF", "W8"}, {"pdl", "application/pdf,image/urf"}};
 
-void addQueue(ipp_t* answer, const char* name, std::string_view uri) {
-    ippAddString(answer, IPP_TAG_PRINTER, IPP_TAG_NAME, "printer-name", nullptr, name);
-    ippAddString(answer, IPP_TAG_PRINTER, IPP_TAG_URI, "device-uri", nullptr, std::string(uri).c_str());
-    ippAddInteger(answer, IPP_TAG_PRINTER, IPP_TAG_ENUM, "printer-type", 4);
-    ippAddSeparator(answer);
-}
-
-// A computer whose scheduler has the queues that `existing` names, and whose print system is in memory.
-class Maker : public testing::Test {
+class Maker : public QueueMaking {
 protected:
     // Makes the queue of a driverless printer that describes itself so.
     std::int32_t make(DeviceDescription description = kDriverless) {
         printer_.setAttributes(std::move(description));
-        testing::internal::CaptureStdout();
-        const auto status = maker_.createQueueForDevice(printer_);
-        output_ = testing::internal::GetCapturedStdout();
-        return status;
+        return makeFor(printer_);
     }
 
-    void TearDown() override {
-        EXPECT_EQ(files_.left(), std::vector<std::string>{});
-        EXPECT_EQ(printSystem_.contextsAlive, 0);
-    }
-
-    OwnTemporaryFiles files_;
-    std::vector<std::pair<const char*, std::string_view>> existing_;
-    ScriptedScheduler scheduler_{[this](ipp_t* answer) {
-        for (const auto& [name, uri] : existing_)
-            addQueue(answer, name, uri);
-    }};
-    UseScheduler use_{scheduler_.address()};
-    FakePlatform fake_;
-    FakePrintSystem& printSystem_ = fake_.printSystem;
-    PPDManager drivers_{fake_.platform};
-    QueueMaker maker_{fake_.platform, drivers_};
     VellumProfilePrinterObject printer_{fake_.platform, drivers_, std::string(kURI)};
-    std::string output_;
 };
 
 TEST_F(Maker, MakesAQueueForADriverlessPrinter) {
@@ -97,10 +65,14 @@ TEST_F(Maker, FindsTheNewPPDInAFolderWithAnOddName) {
 }
 
 TEST_F(Maker, SelectsOptionsOnACopyOfTheDriverForABinaryChannel) {
+    std::string text;
+    printSystem_.autoSelection.onSelect = [&](auto&, const std::string& path) { text = readFile(path); };
     EXPECT_EQ(make(), 0);
     EXPECT_EQ(printSystem_.binaryOK, std::vector{true});
     ASSERT_EQ(printSystem_.autoSelected.size(), 1U);
     EXPECT_EQ(std::filesystem::path(printSystem_.autoSelected[0]).parent_path(), files_.folder());
+    EXPECT_NE(text, "");
+    EXPECT_EQ(text, readFile(*drivers_.genericURFPPD().name));
 }
 
 TEST_F(Maker, GivesTheQueueNoLocationWhenTheComputerHasNoName) {
