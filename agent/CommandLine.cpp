@@ -16,8 +16,8 @@ struct Rule {
     std::size_t dropped;  // characters in front of the text
 };
 
-// The order counts: what begins like an earlier rule never reaches a later one. So "-d" is always the option of
-// old and its second rule never holds, and a scanner may end in "--skerrow".
+// The order counts: what begins like an earlier rule never reaches a later one. So "-d" is always the option
+// of old and its second rule never holds, and a scanner may end in "--skerrow".
 constexpr std::array kRules{
     Rule{Test::BeginsWith, "-b", ArgumentKind::Deprecated, 0},
     Rule{Test::BeginsWith, "-t", ArgumentKind::Deprecated, 0},

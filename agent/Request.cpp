@@ -65,7 +65,8 @@ public:
 
 private:
     void takeScanner(std::string_view description) {
-        if (auto scanner = ScannerObject::scannerObjectWithString(description, usb_, platform_.computerName)) {
+        if (auto scanner =
+                ScannerObject::scannerObjectWithString(description, usb_, platform_.computerName)) {
             request_.devices.push_back(std::move(scanner));
             request_.downloadsDrivers = false;
         }
@@ -87,7 +88,8 @@ private:
 
 }  // namespace
 
-Request requestFromArguments(std::span<const std::string> arguments, Platform& platform, PPDManager& drivers) {
+Request requestFromArguments(std::span<const std::string> arguments, Platform& platform,
+                             PPDManager& drivers) {
     Reader reader(platform, drivers);
     for (const auto& argument : arguments)
         reader.take(argument);

@@ -13,9 +13,10 @@ struct Platform;
 
 /// What a command line asks for.
 struct Request {
-    std::vector<DevicePtr> devices;  ///< those that the arguments describe, in order, then those found on the USB
-    bool downloadsDrivers = true;    ///< whether missing drivers may be downloaded
-    bool skerrow = false;            ///< whether missing drivers are announced instead of offered
+    std::vector<DevicePtr>
+        devices;  ///< those that the arguments describe, in order, then those found on the USB
+    bool downloadsDrivers = true;  ///< whether missing drivers may be downloaded
+    bool skerrow = false;          ///< whether missing drivers are announced instead of offered
     bool namesIppUsbPrinter = false;
 };
 

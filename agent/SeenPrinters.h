@@ -9,8 +9,8 @@ namespace ventras {
 class PreferenceStore;
 class VentrasPrinterObject;
 
-/// Remembers, for one run, the devices already considered for a driver download, and writes them to the user's
-/// preferences, which are never read back. Main thread only.
+/// Remembers, for one run, the devices already considered for a driver download, and writes them to the
+/// user's preferences, which are never read back. Main thread only.
 class SeenPrinters {
 public:
     static constexpr std::string_view kDomain = "com.quillon.print.ventrasagent";

@@ -63,6 +63,7 @@ void VentrasController::startDeviceBrowser(const Request& request) {
 }
 
 void VentrasController::startRound(std::span<const DevicePtr> devices) {
+    roundIsRunning_ = true;
     downloadOperation_ = DownloadTriggerOperation::downloadTriggerOperationWithDelegate(*this, platform_);
     for (const auto& device : devices) {
         auto operation = VentraOperation::operationWithDelegate(*this, device, platform_, drivers_);
@@ -92,6 +93,7 @@ void VentrasController::queueOperationCompleted(const VentraOperation& operation
 }
 
 void VentrasController::downloadOperationCompleted(DownloadTriggerOperation& operation) {
+    roundIsRunning_ = false;
     if (operation.printers().empty()) {
         terminateApplication(static_cast<std::int64_t>(exitStatus_));
         return;
@@ -119,7 +121,8 @@ bool VentrasController::considerSoftwareFor(VentrasPrinterObject& printer) {
     const auto* usbPrinter = skerrow_ ? dynamic_cast<const USBPrinterObject*>(&printer) : nullptr;
     if (usbPrinter != nullptr) {
         platform_.notifications.post(
-            "skerrowed-notification", {{"1284 DeviceID", usbPrinter->deviceID().value_or("")}, {"Match", count}});
+            "skerrowed-notification",
+            {{"1284 DeviceID", usbPrinter->deviceID().value_or("")}, {"Match", count}});
         return false;
     }
     return count == 1 && !reply.dictionary.contains("conflicts");
@@ -158,9 +161,10 @@ void VentrasController::updateMFPs() {
     for (const auto& printer : printersAdded_) {
         const auto scanner = std::ranges::find_if(
             imageDevices, [&](const ImageDevice& device) { return printer->matchesIDDevice(device); });
-        if (scanner != imageDevices.end())
-            rewriteQueuePPDForScanner(platform_.printSystem, printer->queueID(), scanner->uuidString,
-                                      scanner->modulePath);
+        if (scanner == imageDevices.end())
+            continue;
+        const auto uuid = scanner->uuidString.empty() ? std::nullopt : std::optional{scanner->uuidString};
+        rewriteQueuePPDForScanner(platform_.printSystem, printer->queueID(), uuid, scanner->modulePath);
     }
 }
 
@@ -169,7 +173,11 @@ void VentrasController::notifyDriversInstalled() {
         deviceBrowser_->announceNewSoftwareInstalled();
 }
 
+// No install is under way while a round runs. An installer that says twice how it ended must not end the run
+// then: the operations would wait for ever to report to a main thread that waits for them.
 void VentrasController::predicateInstallDidComplete() {
+    if (roundIsRunning_)
+        return;
     const auto offered = downloadOperation_ ? downloadOperation_->printers() : std::vector<DevicePtr>{};
     if (offered.empty()) {
         terminateApplication(kNothingStarted);
@@ -180,11 +188,13 @@ void VentrasController::predicateInstallDidComplete() {
 }
 
 void VentrasController::predicateInstallUserDidCancel() {
-    terminateApplication(kUserCancelled);
+    if (!roundIsRunning_)
+        terminateApplication(kUserCancelled);
 }
 
 void VentrasController::predicateInstallDidFailWithError(std::int64_t code) {
-    terminateApplication(code);
+    if (!roundIsRunning_)
+        terminateApplication(code);
 }
 
 }  // namespace ventras

@@ -87,6 +87,7 @@ private:
     std::shared_ptr<DownloadTriggerOperation> downloadOperation_;
     std::uint64_t exitStatus_ = 0;
     bool done_ = false;
+    bool roundIsRunning_ = false;
     bool downloadDrivers_ = true;
     bool driversDownloaded_ = false;
     bool skerrow_ = false;

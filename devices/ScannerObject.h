@@ -19,24 +19,27 @@ class USBPrinterObject;
 class ScannerObject final : public VentrasPrinterObject {
 public:
     /// Bits of type().
-    static constexpr std::uint64_t kLocalScanner = 0x100;    ///< USB and FireWire
-    static constexpr std::uint64_t kSharedScanner = 0x200;   ///< served by another computer
+    static constexpr std::uint64_t kLocalScanner = 0x100;   ///< USB and FireWire
+    static constexpr std::uint64_t kSharedScanner = 0x200;  ///< served by another computer
     static constexpr std::uint64_t kNetworkScanner = 0x400;
 
     /// Reads a scanner's description: fields separated by ",", without quoting.
     ///
-    /// USB: UUID, persistent ID, name, icon path, "USB", location, product, vendor (decimal), and optionally the
-    /// path of the driver module. FireWire: the first four, "FireWire", GUID (decimal), and optionally the path.
+    /// USB: UUID, persistent ID, name, icon path, "USB", location, product, vendor (decimal), and optionally
+    /// the path of the driver module. FireWire: the first four, "FireWire", GUID (decimal), and optionally
+    /// the path.
     /// @param usb looks for the printer half of a USB scanner
     /// @return null for any other form; network scanners have none.
-    static std::shared_ptr<ScannerObject> scannerObjectWithString(std::string_view description, UsbEnumeration& usb,
+    static std::shared_ptr<ScannerObject> scannerObjectWithString(std::string_view description,
+                                                                  UsbEnumeration& usb,
                                                                   ComputerName& computerName);
 
     /// A scanner on the USB, on FireWire, and on the network.
-    ScannerObject(ComputerName& computerName, std::string uuid, std::string persistentID, std::uint32_t location,
-                  std::uint32_t product, std::uint32_t vendor);
+    ScannerObject(ComputerName& computerName, std::string uuid, std::string persistentID,
+                  std::uint32_t location, std::uint32_t product, std::uint32_t vendor);
     ScannerObject(ComputerName& computerName, std::string uuid, std::string persistentID, std::int64_t guid);
-    ScannerObject(ComputerName& computerName, std::string uuid, std::string persistentID, std::string serviceName);
+    ScannerObject(ComputerName& computerName, std::string uuid, std::string persistentID,
+                  std::string serviceName);
 
     const std::string& uuidString() const { return uuidString_; }
     const std::string& persistentID() const { return persistentID_; }
@@ -66,8 +69,8 @@ public:
     /// Location of the queue for people: the computer for scanners that hang on it, else "".
     std::optional<std::string> deviceLocation() const;
 
-    /// Writes a PPD (Adobe PPD 4.3) by which a queue stands for this scanner and prints nothing. The values go
-    /// into it as they stand; the print system refuses a file that they break.
+    /// Writes a PPD (Adobe PPD 4.3) by which a queue stands for this scanner and prints nothing. The values
+    /// go into it as they stand; the print system refuses a file that they break.
     /// @return path of a new temporary file that the caller deletes; absent when it cannot be written.
     std::optional<std::string> ppdFile() const;
 

@@ -31,8 +31,8 @@ struct TagPredicate::Node {
     std::vector<std::unique_ptr<const Node>> parts;
 };
 
-// Recursive descent: a condition is ANDs joined by OR, those are terms joined by AND, and a term is a condition
-// in parentheses or `"tag" IN tags`.
+// Recursive descent: a condition is ANDs joined by OR, those are terms joined by AND, and a term is a
+// condition in parentheses or `"tag" IN tags`.
 class TagPredicate::Parser {
 public:
     explicit Parser(std::string_view text) : rest_(text) {}

@@ -10,8 +10,8 @@ namespace ventras {
 
 /// A condition over a set of tags, e.g. `(("a" IN tags) OR ("b" in tags)) AND ("c" IN tags)`.
 ///
-/// Texts stand in double quotes, without escapes; the words AND, OR and IN are read in any case; AND binds closer
-/// than OR. Immutable; any thread may evaluate.
+/// Texts stand in double quotes, without escapes; the words AND, OR and IN are read in any case; AND binds
+/// closer than OR. Immutable; any thread may evaluate.
 class TagPredicate {
 public:
     /// Reads a condition. @return absent when the text is not exactly one condition, or nests too deeply.

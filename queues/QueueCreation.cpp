@@ -28,7 +28,8 @@ class UsbGuard {
 public:
     explicit UsbGuard(const std::string& deviceURI) {
         std::string path = "/tmp/" + deviceURI;
-        std::replace_if(path.begin() + 5, path.end(), [](char c) { return c == '/' || c == '?'; }, '.');
+        std::replace_if(
+            path.begin() + 5, path.end(), [](char c) { return c == '/' || c == '?'; }, '.');
         if (!isValidUtf8(path) || path.size() >= kLongestGuardName)
             return;
         descriptor_ = open(path.c_str(), O_RDWR | O_CREAT | O_EXCL | O_CLOEXEC, 0600);
@@ -57,7 +58,8 @@ QueueCreation::QueueCreation(Platform& platform, const QueueInventory& inventory
     : platform_(platform), inventory_(inventory) {}
 
 QueueCreationResult QueueCreation::createQueue(const std::optional<std::string>& location,
-                                               const QueueAttributes& attributes, DefaultPrinter defaultPrinter,
+                                               const QueueAttributes& attributes,
+                                               DefaultPrinter defaultPrinter,
                                                VentrasPrinterObject& device) const {
     QueueCreationResult existing{QueueStatus::kAlreadyExists, std::nullopt};
     bool proceeds = true;
@@ -82,7 +84,8 @@ QueueCreationResult QueueCreation::createQueue(const std::optional<std::string>&
     return createUnderLock(complete, displayName, defaultPrinter);
 }
 
-QueueCreationResult QueueCreation::createUnderLock(const QueueAttributes& attributes, const std::string& displayName,
+QueueCreationResult QueueCreation::createUnderLock(const QueueAttributes& attributes,
+                                                   const std::string& displayName,
                                                    DefaultPrinter defaultPrinter) const {
     auto& printSystem = platform_.printSystem;
     const auto serialized = xmlPropertyList(attributes);

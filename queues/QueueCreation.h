@@ -15,7 +15,8 @@ struct Platform;
 /// Outcomes of making a queue that are this system's own; every other value is the print system's.
 namespace QueueStatus {
 inline constexpr std::int32_t kCreated = 0;
-inline constexpr std::int32_t kAlreadyExists = 242;  ///< a queue serves the device, or another process makes it
+inline constexpr std::int32_t kAlreadyExists =
+    242;  ///< a queue serves the device, or another process makes it
 inline constexpr std::int32_t kNoDriver = 241;
 inline constexpr std::int32_t kCannotHandle = 255;
 inline constexpr std::int32_t kNoDevice = -1;
@@ -39,13 +40,14 @@ public:
 
     /// Makes one queue; a failure leaves none behind.
     ///
-    /// A USB device is guarded against other processes by a file "/tmp/URI" that is made exclusively; the name
-    /// is fixed because every process must arrive at the same one.
+    /// A USB device is guarded against other processes by a file "/tmp/URI" that is made exclusively; the
+    /// name is fixed because every process must arrive at the same one.
     /// @param location text for people; absent = none
     /// @param attributes with "Printer URI"
     /// @param device gives the name
-    QueueCreationResult createQueue(const std::optional<std::string>& location, const QueueAttributes& attributes,
-                                    DefaultPrinter defaultPrinter, VentrasPrinterObject& device) const;
+    QueueCreationResult createQueue(const std::optional<std::string>& location,
+                                    const QueueAttributes& attributes, DefaultPrinter defaultPrinter,
+                                    VentrasPrinterObject& device) const;
 
 private:
     QueueCreationResult createUnderLock(const QueueAttributes& attributes, const std::string& displayName,

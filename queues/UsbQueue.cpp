@@ -33,11 +33,13 @@ std::int32_t QueueMaker::createQueue(USBPrinterObject& printer) {
     const auto ppd = TemporaryFile::adopt(*ppdPath);
 
     // A printer that cannot tell its options still prints with the driver as it is.
-    const auto options = applyInstallableOptions(printer.deviceURI().value_or(""), ppd.path(), choice->channel);
+    const auto options =
+        applyInstallableOptions(printer.deviceURI().value_or(""), ppd.path(), choice->channel);
     auto attributes = printer.driverInfo(choice->driver).value_or(QueueAttributes{});
     attributes.insert_or_assign(std::string(QueueAttributeKeys::kPPD),
                                 options.newPPD ? options.newPPD->path() : ppd.path());
-    auto result = creation_.createQueue(platform_.computerName.computerName(), attributes, newDefaultPrinter(), printer);
+    auto result = creation_.createQueue(platform_.computerName.computerName(), attributes,
+                                        newDefaultPrinter(), printer);
     if (result.status == QueueStatus::kCreated && result.queueID)
         printer.setQueueID(std::move(result.queueID));
     return result.status;
@@ -52,7 +54,8 @@ std::optional<QueueMaker::DriverChoice> QueueMaker::chooseUsbDriver(USBPrinterOb
 
 // A PostScript printer knows its own product name, which may name a driver that its device ID does not.
 std::optional<QueueMaker::DriverChoice> QueueMaker::askForDriver(USBPrinterObject& printer) {
-    const auto [status, context] = platform_.printSystem.autoSelectCreateContext(printer.deviceURI().value_or(""));
+    const auto [status, context] =
+        platform_.printSystem.autoSelectCreateContext(printer.deviceURI().value_or(""));
     if (status != 0 || context->autoSelectPPD() != 0)
         return std::nullopt;
     const auto info = context->autoSelectGetInfo();

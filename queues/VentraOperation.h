@@ -17,8 +17,9 @@ struct Platform;
 /// hears of it, and constant afterwards.
 class VentraOperation final : public Operation {
 public:
-    static std::shared_ptr<VentraOperation> operationWithDelegate(OperationDelegate& delegate, DevicePtr printer,
-                                                                  Platform& platform, PPDManager& drivers);
+    static std::shared_ptr<VentraOperation> operationWithDelegate(OperationDelegate& delegate,
+                                                                  DevicePtr printer, Platform& platform,
+                                                                  PPDManager& drivers);
 
     /// @param delegate not owned; outlives the operation
     /// @param printer may be empty: the operation then reports that there is no device

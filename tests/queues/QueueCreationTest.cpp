@@ -10,10 +10,10 @@
 #include <thread>
 #include <vector>
 
-#include "devices/VentrasPrinterObject.h"
 #include "platform/PropertyList.h"
 #include "queues/QueueInventory.h"
 #include "queues/QueueLock.h"
+#include "tests/devices/FakeDevice.h"
 #include "tests/fakes/FakePlatform.h"
 #include "tests/fakes/PropertyValuePrinter.h"
 #include "tests/parts/TemporaryFolder.h"
@@ -22,15 +22,6 @@ namespace ventras {
 namespace {
 
 using Name = std::optional<std::string>;
-
-class NamedDevice final : public VentrasPrinterObject {
-public:
-    explicit NamedDevice(Name name) : name_(std::move(name)) {}
-    Name name() override { return name_; }
-
-private:
-    Name name_;
-};
 
 // A computer whose scheduler is down: the queues that exist are those of its saved list.
 class Creation : public testing::Test {
@@ -44,7 +35,7 @@ protected:
     QueueCreationResult create(const QueueAttributes& attributes, const Name& name = "Office",
                                const Name& location = std::nullopt,
                                DefaultPrinter defaultPrinter = DefaultPrinter::Keep) {
-        NamedDevice device(name);
+        FakeDevice device(name);
         testing::internal::CaptureStdout();
         auto result = creation_.createQueue(location, attributes, defaultPrinter, device);
         output_ = testing::internal::GetCapturedStdout();
@@ -293,7 +284,7 @@ TEST_F(Creation, GivesDevicesOfOneNameMatchingNamesAndIdentifiersWhenMadeAtOnce)
         std::vector<std::jthread> threads;
         for (int i = 0; i < kDevices; ++i)
             threads.emplace_back([this] {
-                NamedDevice device("Office");
+                FakeDevice device("Office");
                 EXPECT_EQ(
                     creation_.createQueue(std::nullopt, kNetworkPrinter, DefaultPrinter::Keep, device).status,
                     0);

@@ -86,12 +86,8 @@ TEST_F(Inventory, HoldsTheQueuesOfTheAcceptedSchemesOnly) {
 
 TEST_F(Inventory, ComparesSchemesWithRegardToCase) {
     const ScriptedScheduler scheduler([](ipp_t* answer) {
-        for (const char* uri : {"USB://x", "Ipp://x", "ipp://y"}) {
-            ippAddString(answer, IPP_TAG_PRINTER, IPP_TAG_NAME, "printer-name", nullptr, uri);
-            ippAddString(answer, IPP_TAG_PRINTER, IPP_TAG_URI, "device-uri", nullptr, uri);
-            ippAddInteger(answer, IPP_TAG_PRINTER, IPP_TAG_ENUM, "printer-type", 4);
-            ippAddSeparator(answer);
-        }
+        for (const char* uri : {"USB://x", "Ipp://x", "ipp://y"})
+            addQueue(answer, uri, uri);
     });
     const UseScheduler use(scheduler.address());
     EXPECT_EQ(namesOf(withoutSavedList().existingQueues()), (std::vector<std::string>{"ipp://y"}));

@@ -7,7 +7,9 @@
 #include <vector>
 
 #include "devices/VellumProfilePrinterObject.h"
+#include "tests/devices/FakeDevice.h"
 #include "tests/fakes/PropertyValuePrinter.h"
+#include "tests/queues/LostGenericDriver.h"
 #include "tests/queues/QueueMaking.h"
 
 namespace ventras {
@@ -135,13 +137,7 @@ TEST_F(Maker, ForgetsTheQueueOfAnEarlierRound) {
 }
 
 TEST_F(Maker, HasNoDriverWhenTheGenericOneCannotBeFetched) {
-    const TemporaryFolder resources;
-    fake_.resources.folder = resources.path();
-    const auto ppd = resources.write("Vellum.ppd",
-                                     "*PPD-Adobe: \"4.3\"\n*FormatVersion: \"4.3\"\n*ModelName: \"V\"\n"
-                                     "*NickName: \"V\"\n*PSVersion: \"(1) 0\"\n");
-    drivers_.genericURFPPD();
-    std::filesystem::remove(ppd);
+    const LostGenericDriver lost(fake_, drivers_);
     EXPECT_EQ(make(), 241);
     EXPECT_EQ(printSystem_.creations.size(), 0U);
     EXPECT_EQ(printSystem_.autoSelected.size(), 0U);
@@ -179,8 +175,7 @@ TEST_F(Maker, HandsUpTheStatusOfQueueCreation) {
 }
 
 TEST_F(Maker, CannotHandleADeviceOfAnUnknownKind) {
-    class Unknown final : public VentrasPrinterObject {
-    } unknown;
+    FakeDevice unknown;
     EXPECT_EQ(maker_.createQueueForDevice(unknown), 255);
 }
 

@@ -16,8 +16,8 @@
 
 namespace ventras {
 
-/// A computer whose scheduler has the queues that `existing_` names, and whose print system is in memory. Fails
-/// when a temporary file, or a context of option selection, is left behind.
+/// A computer whose scheduler has the queues that `existing_` names, and whose print system is in memory.
+/// Fails when a temporary file, or a context of option selection, is left behind.
 class QueueMaking : public testing::Test {
 protected:
     /// Makes the queue of a device; `output_` is what was printed meanwhile.
@@ -31,7 +31,7 @@ protected:
     /// Adds the scheduler's own answers, e.g. its drivers; the queues come by themselves.
     virtual void answer(ipp_t* answer) {
         for (const auto& [name, uri] : existing_)
-            addQueue(answer, name, uri);
+            addQueue(answer, name, std::string(uri));
     }
 
     void TearDown() override {
@@ -49,14 +49,6 @@ protected:
     PPDManager drivers_{fake_.platform};
     QueueMaker maker_{fake_.platform, drivers_};
     std::string output_;
-
-private:
-    static void addQueue(ipp_t* answer, const char* name, std::string_view uri) {
-        ippAddString(answer, IPP_TAG_PRINTER, IPP_TAG_NAME, "printer-name", nullptr, name);
-        ippAddString(answer, IPP_TAG_PRINTER, IPP_TAG_URI, "device-uri", nullptr, std::string(uri).c_str());
-        ippAddInteger(answer, IPP_TAG_PRINTER, IPP_TAG_ENUM, "printer-type", 4);
-        ippAddSeparator(answer);
-    }
 };
 
 }  // namespace ventras

@@ -19,8 +19,8 @@ protected:
     }
 
     void joinPrinter() {
-        scanner_.setPrinter(USBPrinterObject::usbPrinterObjectWithLocation(fake_.platform, drivers_, 1, 0, 3, 2,
-                                                                           "MFG:Acme;MDL:Multi;SN:7;"));
+        scanner_.setPrinter(USBPrinterObject::usbPrinterObjectWithLocation(fake_.platform, drivers_, 1, 0, 3,
+                                                                           2, "MFG:Acme;MDL:Multi;SN:7;"));
     }
 
     ScannerObject scanner_{fake_.computerName, "uuid-1", "P", 1, 2, 3};
@@ -41,8 +41,9 @@ TEST_F(ScannerQueue, IsMadeForAScannerOnly) {
               "*cupsLanguages: \"en\"\n");
     auto attributes = creation.attributes;
     EXPECT_EQ(attributes.erase("com.quillon.print.PrinterInfo.PPD"), 1U);
-    EXPECT_EQ(attributes, (PropertyDictionary{
-                              {"Printer URI", "usb://uuid-1"}, {"Scanner", true}, {"Location", "Reading Room"}}));
+    EXPECT_EQ(attributes,
+              (PropertyDictionary{
+                  {"Printer URI", "usb://uuid-1"}, {"Scanner", true}, {"Location", "Reading Room"}}));
     EXPECT_EQ(output_, "Queue ID:Flatbed\n");  // no features are determined for a scanner
 }
 

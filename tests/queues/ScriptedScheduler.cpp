@@ -61,4 +61,11 @@ ScriptedReply ScriptedScheduler::reply(const HttpMessage& message) {
     return {.bytes = httpResponse("200 OK", "application/ipp", encodeIpp(answer.get()))};
 }
 
+void addQueue(ipp_t* answer, const std::string& name, const std::string& uri) {
+    ippAddString(answer, IPP_TAG_PRINTER, IPP_TAG_NAME, "printer-name", nullptr, name.c_str());
+    ippAddString(answer, IPP_TAG_PRINTER, IPP_TAG_URI, "device-uri", nullptr, uri.c_str());
+    ippAddInteger(answer, IPP_TAG_PRINTER, IPP_TAG_ENUM, "printer-type", 4);
+    ippAddSeparator(answer);
+}
+
 }  // namespace ventras

@@ -43,4 +43,7 @@ private:
     std::jthread thread_;
 };
 
+/// Adds a queue to an answer, as the real scheduler describes one.
+void addQueue(ipp_t* answer, const std::string& name, const std::string& uri);
+
 }  // namespace ventras

@@ -34,15 +34,16 @@ protected:
     }
 
     std::int32_t make(std::optional<std::string> deviceID) {
-        printer_ = USBPrinterObject::usbPrinterObjectWithLocation(fake_.platform, drivers_, 0x14100000, 0, 1008, 17,
-                                                                  std::move(deviceID));
+        printer_ = USBPrinterObject::usbPrinterObjectWithLocation(fake_.platform, drivers_, 0x14100000, 0,
+                                                                  1008, 17, std::move(deviceID));
         return makeFor(*printer_);
     }
 
     // A driver whose PPD is a file of this computer, for a device that names it.
     void installDriver(const std::string& model, const std::string& type = "postscript") {
         const auto path = folder_.write(model + ".ppd", ppdText(model));
-        catalogue_.push_back({path.string(), "Acme " + model, "MFG:Acme;MDL:" + model + ";", "(" + model + ")", type});
+        catalogue_.push_back(
+            {path.string(), "Acme " + model, "MFG:Acme;MDL:" + model + ";", "(" + model + ")", type});
     }
 
     static std::string ppdText(const std::string& model) {

@@ -11,6 +11,7 @@
 #include "drivers/PPDManager.h"
 #include "platform/OperationQueue.h"
 #include "queues/OperationDelegate.h"
+#include "tests/devices/FakeDevice.h"
 #include "tests/fakes/FakePlatform.h"
 #include "tests/parts/PrivateScheduler.h"
 #include "tests/queues/OwnTemporaryFiles.h"
@@ -21,16 +22,6 @@ namespace {
 using namespace std::chrono_literals;
 
 const DeviceDescription kDriverless{{"display-name", "Office"}, {"URF", "W8"}, {"pdl", "image/urf"}};
-
-class UnknownDevice final : public VentrasPrinterObject {
-public:
-    explicit UnknownDevice(std::string uri) : uri_(std::move(uri)) {}
-    std::optional<std::string> name() override { return "a thing"; }
-    std::optional<std::string> deviceURI() override { return uri_; }
-
-private:
-    std::string uri_;
-};
 
 // Keeps what it hears, and stops the run loop after so many reports.
 class Recorder final : public OperationDelegate {
@@ -144,7 +135,7 @@ TEST_F(QueueOperation, SaysInTheLogWhatTheDeviceLacks) {
 }
 
 TEST_F(QueueOperation, NamesADeviceInTheLogThatHasNoURI) {
-    EXPECT_EQ(run({std::make_shared<UnknownDevice>("")}).statuses, std::vector{255});
+    EXPECT_EQ(run({std::make_shared<FakeDevice>("a thing", std::nullopt, "")}).statuses, std::vector{255});
     EXPECT_EQ(fake_.log.lines(),
               std::vector<std::string>{"No queue for a thing: it is of no kind that can be set up (255)"});
 }

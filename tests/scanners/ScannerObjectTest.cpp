@@ -151,7 +151,8 @@ TEST_F(Scanner, TakesTheFirstOfTwoPrintersInOnePlace) {
 }
 
 TEST_F(Scanner, DescribesItselfWithVendorAndProductCrossed) {
-    EXPECT_EQ(scanner("U,P,N,/i,USB,336592896,17,1008")->description(), "usb:[loc:336592896 vend:17 prod:1008] [U]");
+    EXPECT_EQ(scanner("U,P,N,/i,USB,336592896,17,1008")->description(),
+              "usb:[loc:336592896 vend:17 prod:1008] [U]");
     EXPECT_EQ(scanner("U,P,N,/i,FireWire,-5")->description(), "firewire:-5 [U]");
     EXPECT_EQ(ScannerObject(fake_.computerName, "U", "P", std::string("Service")).description(),
               "Corvid:Service [U]");
@@ -230,7 +231,8 @@ TEST_F(Scanner, MarksTheQueueAsSharedOnlyByThatBit) {
 
 TEST_F(Scanner, WritesHostileNamesAsTheyStand) {
     const std::string longName(5000, 'n');
-    for (const auto& name : {std::string("say \"cheese\""), std::string("two\nlines"), longName, std::string()}) {
+    for (const auto& name :
+         {std::string("say \"cheese\""), std::string("two\nlines"), longName, std::string()}) {
         ScannerObject found(fake_.computerName, "U", "P", 1, 2, 3);
         found.setName(name);
         EXPECT_NE(ppdOf(found)->find("*NickName: \"" + name + "\"\n"), std::string::npos) << name;

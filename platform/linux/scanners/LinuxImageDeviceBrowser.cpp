@@ -18,9 +18,9 @@ void LinuxImageDeviceBrowser::start() {
         return;
     const auto post = [this](ScannerEvent event) { events_.post(std::move(event)); };
     usb_.emplace(post);
-    network_.emplace((mask_ & kRegisteredHere) != 0 ? ScannerServices::AlsoOfThisComputer
-                                                    : ScannerServices::OfTheNetwork,
-                     post);
+    network_.emplace(
+        (mask_ & kRegisteredHere) != 0 ? ScannerServices::AlsoOfThisComputer : ScannerServices::OfTheNetwork,
+        post);
 }
 
 std::vector<ImageDevice> LinuxImageDeviceBrowser::devices() const {
@@ -39,7 +39,8 @@ void LinuxImageDeviceBrowser::announceNewSoftwareInstalled() {
     // New software may know, and serve, devices that were strangers before: look again.
     usb_.reset();
     handleEvents();
-    std::erase_if(known_, [](const auto& each) { return each.second.transport == ImageDeviceTransport::kUSB; });
+    std::erase_if(known_,
+                  [](const auto& each) { return each.second.transport == ImageDeviceTransport::kUSB; });
     usb_.emplace([this](ScannerEvent event) { events_.post(std::move(event)); });
 }
 

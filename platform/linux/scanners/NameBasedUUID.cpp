@@ -19,7 +19,8 @@ std::string nameBasedUUID(std::string_view name) {
     const std::unique_ptr<GChecksum, decltype(&g_checksum_free)> checksum{g_checksum_new(G_CHECKSUM_SHA1),
                                                                           &g_checksum_free};
     g_checksum_update(checksum.get(), kNamespace.data(), kNamespace.size());
-    g_checksum_update(checksum.get(), reinterpret_cast<const guchar*>(name.data()), static_cast<gssize>(name.size()));
+    g_checksum_update(checksum.get(), reinterpret_cast<const guchar*>(name.data()),
+                      static_cast<gssize>(name.size()));
     std::array<guint8, 20> digest{};
     gsize length = digest.size();
     g_checksum_get_digest(checksum.get(), digest.data(), &length);

@@ -22,7 +22,8 @@ struct ScannerEvent {
 
 /// Carries events from the watches' threads to the main thread, in order.
 ///
-/// Any thread may post; construct, destroy and take on the main thread. Nothing is delivered after destruction.
+/// Any thread may post; construct, destroy and take on the main thread. Nothing is delivered after
+/// destruction.
 class ScannerEvents {
 public:
     using Handler = std::function<void()>;

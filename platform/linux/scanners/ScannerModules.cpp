@@ -55,7 +55,8 @@ ScannerModuleFolders ScannerModuleFolders::ofThisComputer() {
         const char* value = std::getenv(variable);
         return std::filesystem::path(value != nullptr && *value != '\0' ? value : otherwise);
     };
-    return {folder("VENTRAS_SCANNER_CONFIGURATION", "/etc/sane.d"), folder("VENTRAS_SCANNER_MODULES", kModules)};
+    return {folder("VENTRAS_SCANNER_CONFIGURATION", "/etc/sane.d"),
+            folder("VENTRAS_SCANNER_MODULES", kModules)};
 }
 
 std::optional<std::string> scannerModuleForUsb(std::uint16_t vendor, std::uint16_t product,

@@ -19,12 +19,12 @@ struct ScannerModuleFolders {
 
 /// Path of the module whose configuration names a USB device; absent when none does, or it is not installed.
 /// Any thread may call; it reads files.
-std::optional<std::string> scannerModuleForUsb(std::uint16_t vendor, std::uint16_t product,
-                                               const ScannerModuleFolders& folders =
-                                                   ScannerModuleFolders::ofThisComputer());
+std::optional<std::string> scannerModuleForUsb(
+    std::uint16_t vendor, std::uint16_t product,
+    const ScannerModuleFolders& folders = ScannerModuleFolders::ofThisComputer());
 
 /// Path of a module by its name, e.g. "airscan"; absent when it is not installed.
-std::optional<std::string> scannerModuleNamed(std::string_view name, const ScannerModuleFolders& folders =
-                                                                         ScannerModuleFolders::ofThisComputer());
+std::optional<std::string> scannerModuleNamed(
+    std::string_view name, const ScannerModuleFolders& folders = ScannerModuleFolders::ofThisComputer());
 
 }  // namespace ventras

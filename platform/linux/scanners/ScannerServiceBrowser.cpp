@@ -24,9 +24,12 @@ bool isLoopback(AvahiIfIndex interface) {
     return interface > 0 && static_cast<unsigned>(interface) == if_nametoindex("lo");
 }
 
+// The client library hands the items over in the opposite order.
 std::string recordFrom(AvahiStringList* text) {
-    std::string record(avahi_string_list_serialize(text, nullptr, 0), '\0');
-    record.resize(avahi_string_list_serialize(text, record.data(), record.size()));
+    const std::unique_ptr<AvahiStringList, decltype(&avahi_string_list_free)> items{
+        avahi_string_list_reverse(avahi_string_list_copy(text)), &avahi_string_list_free};
+    std::string record(avahi_string_list_serialize(items.get(), nullptr, 0), '\0');
+    record.resize(avahi_string_list_serialize(items.get(), record.data(), record.size()));
     return record;
 }
 
@@ -74,8 +77,8 @@ void ScannerServiceBrowser::onState(AvahiClient* client, AvahiClientState state,
 
 void ScannerServiceBrowser::browse(AvahiClient* client) {
     for (const auto* type : kServiceTypes) {
-        BrowserPtr browser{avahi_service_browser_new(client, AVAHI_IF_UNSPEC, AVAHI_PROTO_UNSPEC, type, nullptr,
-                                                     AvahiLookupFlags{}, onService, this)};
+        BrowserPtr browser{avahi_service_browser_new(client, AVAHI_IF_UNSPEC, AVAHI_PROTO_UNSPEC, type,
+                                                     nullptr, AvahiLookupFlags{}, onService, this)};
         if (browser)
             browsers_.push_back(std::move(browser));
         else
@@ -99,14 +102,15 @@ void ScannerServiceBrowser::resolve(const Registration& registration, const char
     const auto& [interface, protocol, name, type] = registration;
     if (services_ == ScannerServices::OfTheNetwork && isLoopback(interface))
         return;
-    registrations_[registration].reset(avahi_service_resolver_new(
-        client_.get(), interface, protocol, name.c_str(), type.c_str(), domain, AVAHI_PROTO_UNSPEC,
-        AvahiLookupFlags{}, onResolved, this));
+    registrations_[registration].reset(
+        avahi_service_resolver_new(client_.get(), interface, protocol, name.c_str(), type.c_str(), domain,
+                                   AVAHI_PROTO_UNSPEC, AvahiLookupFlags{}, onResolved, this));
 }
 
-void ScannerServiceBrowser::onResolved(AvahiServiceResolver*, AvahiIfIndex, AvahiProtocol, AvahiResolverEvent event,
-                                       const char* name, const char*, const char*, const char*, const AvahiAddress*,
-                                       std::uint16_t, AvahiStringList* text, AvahiLookupResultFlags, void* data) {
+void ScannerServiceBrowser::onResolved(AvahiServiceResolver*, AvahiIfIndex, AvahiProtocol,
+                                       AvahiResolverEvent event, const char* name, const char*, const char*,
+                                       const char*, const AvahiAddress*, std::uint16_t, AvahiStringList* text,
+                                       AvahiLookupResultFlags, void* data) {
     if (event == AVAHI_RESOLVER_FOUND)
         static_cast<ScannerServiceBrowser*>(data)->tellAdded(name, text);
 }
@@ -127,8 +131,8 @@ void ScannerServiceBrowser::tellAdded(const std::string& name, AvahiStringList* 
 void ScannerServiceBrowser::forget(const Registration& registration) {
     registrations_.erase(registration);
     const auto& name = std::get<2>(registration);
-    const bool isStillThere =
-        std::ranges::any_of(registrations_, [&](const auto& each) { return std::get<2>(each.first) == name; });
+    const bool isStillThere = std::ranges::any_of(
+        registrations_, [&](const auto& each) { return std::get<2>(each.first) == name; });
     if (!isStillThere && told_.erase(name) != 0)
         sink_({ScannerEvent::Kind::Removed, keyOf(name), {}});
 }

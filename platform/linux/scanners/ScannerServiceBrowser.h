@@ -16,8 +16,9 @@
 
 namespace ventras {
 
-/// One connection to the responder that browses for scanner services and tells each scanner once, however many
-/// interfaces, protocols and service types it is registered with. Belongs to the thread that runs `poll`.
+/// One connection to the responder that browses for scanner services and tells each scanner once, however
+/// many interfaces, protocols and service types it is registered with. Belongs to the thread that runs
+/// `poll`.
 class ScannerServiceBrowser {
 public:
     ScannerServiceBrowser(AvahiSimplePoll* poll, ScannerServices services, NetworkScannerWatch::Sink sink);
@@ -51,8 +52,8 @@ private:
                           AvahiLookupResultFlags flags, void* self);
     static void onResolved(AvahiServiceResolver* resolver, AvahiIfIndex interface, AvahiProtocol protocol,
                            AvahiResolverEvent event, const char* name, const char* type, const char* domain,
-                           const char* host, const AvahiAddress* address, std::uint16_t port, AvahiStringList* text,
-                           AvahiLookupResultFlags flags, void* self);
+                           const char* host, const AvahiAddress* address, std::uint16_t port,
+                           AvahiStringList* text, AvahiLookupResultFlags flags, void* self);
 
     void browse(AvahiClient* client);
     void resolve(const Registration& registration, const char* domain);

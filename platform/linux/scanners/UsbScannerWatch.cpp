@@ -73,7 +73,8 @@ bool isInHardwareDatabase(udev* context, std::uint16_t vendor, std::uint16_t pro
     std::snprintf(alias.data(), alias.size(), "usb:v%04Xp%04X", unsigned{vendor}, unsigned{product});
     auto* properties = udev_hwdb_get_properties_list_entry(database.get(), alias.data(), 0);
     const auto* entry = udev_list_entry_get_by_name(properties, kMatched.data());
-    const char* value = entry == nullptr ? nullptr : udev_list_entry_get_value(const_cast<udev_list_entry*>(entry));
+    const char* value =
+        entry == nullptr ? nullptr : udev_list_entry_get_value(const_cast<udev_list_entry*>(entry));
     return value != nullptr && std::string_view(value) == "yes";
 }
 
@@ -83,10 +84,11 @@ bool isScanner(udev* context, udev_device* device, const ImageDevice& identity) 
                               : isInHardwareDatabase(context, identity.usbVendor, identity.usbProduct);
 }
 
-// A scanner on the USB brings no UUID; this one is the same whenever and wherever the same unit is seen. Units
-// without a serial number are told apart by their place.
+// A scanner on the USB brings no UUID; this one is the same whenever and wherever the same unit is seen.
+// Units without a serial number are told apart by their place.
 std::string uuidOf(const ImageDevice& device) {
-    const auto unit = device.serialNumber.empty() ? "@" + std::to_string(device.usbLocation) : device.serialNumber;
+    const auto unit =
+        device.serialNumber.empty() ? "@" + std::to_string(device.usbLocation) : device.serialNumber;
     return nameBasedUUID("usb-scanner:" + std::to_string(device.usbVendor) + ":" +
                          std::to_string(device.usbProduct) + ":" + unit);
 }
@@ -139,8 +141,9 @@ private:
 
 MonitorPtr newMonitor(udev* context) {
     MonitorPtr monitor{udev_monitor_new_from_netlink(context, "udev")};
-    if (monitor && (udev_monitor_filter_add_match_subsystem_devtype(monitor.get(), kSubsystem, kDeviceType) < 0 ||
-                    udev_monitor_enable_receiving(monitor.get()) < 0))
+    if (monitor &&
+        (udev_monitor_filter_add_match_subsystem_devtype(monitor.get(), kSubsystem, kDeviceType) < 0 ||
+         udev_monitor_enable_receiving(monitor.get()) < 0))
         monitor.reset();
     return monitor;
 }

@@ -9,8 +9,8 @@
 
 namespace ventras {
 
-/// Watches for USB scanners that the scanner driver collection knows, through udev and its hardware database; no
-/// device is opened, or woken up. It runs a thread of its own; construct and destroy it on one thread.
+/// Watches for USB scanners that the scanner driver collection knows, through udev and its hardware database;
+/// no device is opened, or woken up. It runs a thread of its own; construct and destroy it on one thread.
 class UsbScannerWatch {
 public:
     using Sink = std::function<void(ScannerEvent)>;
