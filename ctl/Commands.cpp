@@ -1,0 +1,43 @@
+#include "ctl/CatalogueCommand.h"
+#include "ctl/Command.h"
+#include "ctl/DeviceCommand.h"
+#include "ctl/DeviceIDCommand.h"
+#include "ctl/ExplainCommand.h"
+#include "ctl/PPDCommand.h"
+#include "ctl/PrinterCommand.h"
+#include "ctl/QueueCommand.h"
+#include "ctl/ScannersCommand.h"
+
+namespace ventras {
+namespace {
+
+constexpr Command kCommands[] = {
+    {"device-id", "STRING...|-", "what an IEEE 1284 device ID says", showDeviceIDs},
+    {"txt", "[KEY=VALUE...|-]", "what a TXT-style dictionary says", showDescription},
+    {"ppd", "FILE...", "what a PPD file says", showPPDs},
+    {"kind", "", "how driver records rank: reads a JSON array", showKinds},
+    {"match", "[-]", "drivers that fit a device, best first", showMatches, kMatchOptions},
+    {"drivers", "", "the scheduler's catalogue of drivers", showDrivers},
+    {"queues", "", "the queues that the agent takes into account", showQueues},
+    {"name", "STRING|-", "what a device's name becomes as a queue's name", showNames, kNameOptions},
+    {"usb", "", "the USB printer interfaces that are attached", showUsbPrinters},
+    {"scanners", "", "the scanners that are announced within 3 seconds", showScanners},
+    {"printer", "URI", "what a network printer says of itself", showPrinter},
+    {"service", "NAME", "what an IPP-over-USB printer says of itself in DNS-SD", showService},
+    {"scanner", "STRING", "what a scanner's description says, and its PPD", showScanner},
+    {"predicate", "ID...", "how driver packages for devices are asked for", showPredicate},
+    {"explain",
+     "ARGUMENT...",
+     "what the agent would do, if started so",
+     explainArguments,
+     {},
+     OptionOrder::AmongForeign},
+};
+
+}  // namespace
+
+std::span<const Command> commands() {
+    return kCommands;
+}
+
+}  // namespace ventras

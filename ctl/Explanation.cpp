@@ -1,0 +1,114 @@
+#include "ctl/Explanation.h"
+
+#include <algorithm>
+#include <array>
+
+#include "ctl/Evidence.h"
+#include "ctl/Records.h"
+#include "ctl/Services.h"
+#include "ctl/SilentOutput.h"
+#include "ctl/Text.h"
+#include "devices/VentrasPrinterObject.h"
+#include "platform/PropertyList.h"
+#include "queues/QueueInventory.h"
+#include "queues/QueueMaker.h"
+
+namespace ventras {
+namespace {
+
+struct Outcome {
+    std::int32_t status;
+    std::string_view text;
+};
+
+constexpr std::array kOutcomes{
+    Outcome{QueueStatus::kCreated, "a queue would be made"},
+    Outcome{QueueStatus::kAlreadyExists, "nothing: a queue serves it"},
+    Outcome{QueueStatus::kNoDriver, "no queue: no usable driver; software for it would be looked for"},
+    Outcome{QueueStatus::kCannotHandle, "no queue: the device cannot be handled"},
+    Outcome{QueueStatus::kCannotSerialize, "no queue: its description cannot be stored"},
+    Outcome{QueueStatus::kNoIdentifier, "no queue: no identifier can be made of its name"},
+};
+
+std::string_view outcomeOf(std::int32_t status) {
+    const auto known = std::ranges::find(kOutcomes, status, &Outcome::status);
+    return known == kOutcomes.end() ? "no queue: the print system reports this status" : known->text;
+}
+
+/// Why a queue is taken to serve a device.
+Value reasonFor(const std::string& queueID, VentrasPrinterObject& device, const QueueRecords& queues) {
+    const auto queue = std::ranges::find(queues, std::optional{queueID}, &QueueRecord::printerName);
+    if (queue == queues.end())
+        return "the device gives no address to compare";
+    const auto uri = queue->deviceURI.value_or("");
+    if (queue->deviceURI == device.deviceURI())
+        return "its device URI is this device's: " + uri;
+    return "its device URI belongs to the same device: " + uri;
+}
+
+Object objectOf(const PlannedQueue& queue) {
+    const auto attributes = parsePropertyList(queue.attributes);
+    const auto displayName = queue.options.find("PC WSItem User Name");
+    return {{"queueID", queue.queueID},
+            {"displayName", displayName == queue.options.end() ? Value{} : Value{displayName->second}},
+            {"attributes", attributes ? valueOf(*attributes) : Value{}}};
+}
+
+Array arrayOf(const std::vector<PlannedQueue>& queues) {
+    Array array;
+    for (const auto& queue : queues)
+        array.emplace_back(objectOf(queue));
+    return array;
+}
+
+std::string textUnder(const Value& object, std::string_view key) {
+    const auto* member = find(std::get<Object>(object), key);
+    return textOf(member == nullptr ? Value{} : *member);
+}
+
+std::string driverInShort(const Value& driver) {
+    const auto* record = find(std::get<Object>(driver), "record");
+    return textUnder(*record, "ppd_make_and_model") + " (" + textUnder(driver, "reason") + ")";
+}
+
+std::string queueInShort(const Value& queue) {
+    return textUnder(queue, "queueID") + " (" + textUnder(queue, "displayName") + ")";
+}
+
+}  // namespace
+
+Object explain(VentrasPrinterObject& device, Services& services) {
+    const auto queues = QueueInventory(services.platform()).existingQueues().value_or(QueueRecords{});
+    const auto evidence = evidenceOf(device);
+    const auto drivers = driversFor(device);
+    services.printSystem().takePlannedQueues();
+    const auto status = [&] {
+        const SilentOutput silent;
+        return QueueMaker(services.platform(), services.drivers()).createQueueForDevice(device);
+    }();
+    const auto serving = status == QueueStatus::kAlreadyExists ? device.queueID() : std::nullopt;
+    return {
+        {"device", evidence.device},
+        {"name", device.name()},
+        {"deviceURI", device.deviceURI()},
+        {"evidence", evidence.facts},
+        {"queueID", serving},
+        {"queueReason", serving ? reasonFor(*serving, device, queues) : Value{}},
+        {"driverList", drivers},
+        {"status", status},
+        {"outcome", serving == "" ? "nothing: it has no address by which to tell" : outcomeOf(status)},
+        {"difficulty", device.difficulty()},
+        {"createQueue", arrayOf(services.printSystem().takePlannedQueues())},
+    };
+}
+
+Object shortened(const Object& explanation) {
+    Object lines = explanation;
+    for (auto& [key, value] : lines)
+        if (auto* array = std::get_if<Array>(&value))
+            std::ranges::transform(*array, array->begin(),
+                                   key == "driverList" ? driverInShort : queueInShort);
+    return lines;
+}
+
+}  // namespace ventras

@@ -1,0 +1,55 @@
+#include "ctl/ScannersCommand.h"
+
+#include <array>
+#include <chrono>
+
+#include "ctl/Complaint.h"
+#include "ctl/Evidence.h"
+#include "ctl/Output.h"
+#include "ctl/Services.h"
+#include "devices/TXTRecord.h"
+#include "platform/Deadline.h"
+#include "platform/ImageDeviceBrowser.h"
+#include "platform/RunLoop.h"
+
+namespace ventras {
+namespace {
+
+// Responders on a busy network take a second or two to answer.
+constexpr std::chrono::seconds kListeningTime{3};
+
+// All that the agent ever looks for: scanners at this computer and those of IPP-over-USB printers.
+constexpr std::uint64_t kDeviceTypes = 258 | 0xfe00;
+
+constexpr std::array kColumns{Column{"transport", "TRANSPORT"}, Column{"uuidString", "UUID"},
+                              Column{"serialNumber", "SERIAL NUMBER"}, Column{"modulePath", "MODULE"}};
+
+Object rowOf(const ImageDevice& device) {
+    return {{"transport", device.transport},
+            {"usbLocation", device.usbLocation},
+            {"usbVendor", device.usbVendor},
+            {"usbProduct", device.usbProduct},
+            {"serialNumber", device.serialNumber},
+            {"txtRecord", objectOf(dictionaryFromTXTRecord(device.txtRecord))},
+            {"uuidString", device.uuidString},
+            {"modulePath", device.modulePath}};
+}
+
+}  // namespace
+
+Exit showScanners(const Arguments& arguments, Output& output) {
+    if (!arguments.operands.empty())
+        return usageError("scanners: takes no operand");
+    Services services;
+    const auto browser = services.platform().makeImageDeviceBrowser();
+    browser->setBrowsedDeviceTypeMask(kDeviceTypes);
+    browser->start();
+    services.platform().runLoop.runUntil(Deadline::after(kListeningTime));
+    Array rows;
+    for (const auto& device : browser->devices())
+        rows.emplace_back(rowOf(device));
+    output.print(rows, kColumns);
+    return Exit::Success;
+}
+
+}  // namespace ventras
