@@ -5,23 +5,15 @@
 #include <string>
 #include <vector>
 
+#include "tests/devices/FakeDevice.h"
 #include "tests/fakes/FakePlatform.h"
 #include "tests/parts/TemporaryFolder.h"
 
 namespace ventras {
 namespace {
 
-class Device final : public VentrasPrinterObject {
-public:
-    explicit Device(std::optional<std::string> name) : name_(std::move(name)) {}
-    std::optional<std::string> name() override { return name_; }
-
-private:
-    std::optional<std::string> name_;
-};
-
 DevicePtr device(std::optional<std::string> name) {
-    return std::make_shared<Device>(std::move(name));
+    return std::make_shared<FakeDevice>(std::move(name));
 }
 
 TEST(InstallerSettings, AreTheFixedTextsAndDemands) {

@@ -5,21 +5,12 @@
 #include <string>
 #include <vector>
 
-#include "devices/VentrasPrinterObject.h"
+#include "tests/devices/FakeDevice.h"
 #include "tests/fakes/FakePlatform.h"
 #include "tests/fakes/PropertyValuePrinter.h"
 
 namespace ventras {
 namespace {
-
-class Device final : public VentrasPrinterObject {
-public:
-    explicit Device(std::optional<std::string> scanID) : scanID_(std::move(scanID)) {}
-    std::optional<std::string> softwareUpdateScanDeviceID() override { return scanID_; }
-
-private:
-    std::optional<std::string> scanID_;
-};
 
 class Seen : public testing::Test {
 protected:
@@ -27,7 +18,8 @@ protected:
 
     FakePreferences preferences_;
     SeenPrinters seen_{preferences_};
-    Device a_{"A"}, alsoA_{"A"}, lowerCaseA_{"a"}, b_{"B"}, empty_{""}, without_{std::nullopt};
+    FakeDevice a_{"one", "A"}, alsoA_{"two", "A"}, lowerCaseA_{"one", "a"}, b_{"one", "B"}, empty_{"one", ""},
+        without_{"one"};
 };
 
 TEST_F(Seen, ContainsNoDeviceAtFirst) {

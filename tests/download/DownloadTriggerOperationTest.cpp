@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "queues/OperationDelegate.h"
+#include "tests/devices/FakeDevice.h"
 #include "tests/fakes/FakePlatform.h"
 
 namespace ventras {
@@ -88,12 +89,11 @@ TEST(DownloadTrigger, ReportsOnTheMainThreadAndWaitsUntilThatIsHandled) {
 }
 
 TEST(DownloadTrigger, KeepsItsPrintersInTheOrderInWhichTheyAreAdded) {
-    class Device final : public VentrasPrinterObject {};
     FakePlatform fake;
     SlowRecorder delegate;
     DownloadTriggerOperation operation(delegate, fake.platform);
     EXPECT_EQ(operation.printers().size(), 0U);
-    const std::vector<DevicePtr> devices{std::make_shared<Device>(), std::make_shared<Device>()};
+    const std::vector<DevicePtr> devices{std::make_shared<FakeDevice>(), std::make_shared<FakeDevice>()};
     operation.addPrinterForSoftwareUpdate(devices[0]);
     operation.addPrinterForSoftwareUpdate(devices[1]);
     EXPECT_EQ(operation.printers(), devices);
