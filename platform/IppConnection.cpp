@@ -7,8 +7,8 @@
 #include <algorithm>
 #include <array>
 #include <cerrno>
-#include <system_error>
 
+#include "platform/ConnectFailure.h"
 #include "platform/HttpGuard.h"
 
 namespace ventras {
@@ -126,19 +126,20 @@ IppConnection::IppConnection(const std::string& host, int port, http_encryption_
     constexpr int kConnectLater = 0;
     http_.reset(httpConnect2(host.c_str(), port, nullptr, AF_UNSPEC, encryption, 1, kConnectLater, nullptr));
     if (!http_) {
-        failure_ = lastErrorText();
+        failure_ = connectFailure(host, port);
         return;
     }
 
     // The handle comes first and the connection second, so that a TLS handshake is guarded too.
+    const auto deadline = Deadline::after(kConnectLimit);
     int failed = 0;
     {
-        const HttpGuard guard(http_.get(), Deadline::after(kConnectLimit));
+        const HttpGuard guard(http_.get(), deadline);
         failed = httpReconnect2(http_.get(), static_cast<int>(kConnectLimit.count()), nullptr);
     }
     if (failed != 0) {
-        const int error = httpError(http_.get());
-        failure_ = error != 0 ? std::generic_category().message(error) : lastErrorText();
+        failure_ =
+            deadline.passed() ? "no connection within " + seconds(kConnectLimit) : connectFailure(host, port);
         http_.reset();
     }
 }

@@ -42,7 +42,7 @@ public:
     /// Whether the peer was reached.
     bool connected() const { return http_ != nullptr; }
 
-    /// Why the peer was not reached: the text of the system's error.
+    /// Why the peer was not reached: the text of the system's error, or that it took too long.
     const std::string& failure() const { return failure_; }
 
     /// Sends one request and waits for its answer.

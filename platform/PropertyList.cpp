@@ -19,10 +19,24 @@ using PlistText = std::unique_ptr<char, decltype([](char* text) { std::free(text
 // Deeper nesting than this comes from no one who means well.
 constexpr int kDeepest = 64;
 
-// libplist recurses as deep as the data nests, before we see any of it; these sizes cannot nest deep enough
-// to exhaust a stack.
-constexpr std::size_t kLongestXml = 512 * 1024;
+// libplist recurses as deep as the data nests, before we see any of it; so many containers, and so short a
+// binary list, cannot nest deep enough to exhaust a stack.
+constexpr std::size_t kLongestXml = std::size_t{4} * 1024 * 1024;
+constexpr std::size_t kMostXmlContainers = 64 * 1024;
 constexpr std::size_t kLongestBinary = 128 * 1024;
+
+std::size_t countOf(std::string_view wanted, std::string_view text) {
+    std::size_t count = 0;
+    for (auto found = text.find(wanted); found != std::string_view::npos;
+         found = text.find(wanted, found + 1))
+        ++count;
+    return count;
+}
+
+bool isReasonableXml(std::string_view text) {
+    return text.size() <= kLongestXml &&
+           countOf("<array", text) + countOf("<dict", text) <= kMostXmlContainers;
+}
 
 bool fitsXml(std::string_view text) {
     const auto isForbidden = [](char c) {
@@ -135,7 +149,7 @@ std::optional<std::string> xmlPropertyList(const PropertyValue& value) {
 std::optional<PropertyValue> parsePropertyList(std::string_view data) {
     const bool isBinary = data.size() < kLongestBinary &&
                           plist_is_binary(data.data(), static_cast<std::uint32_t>(data.size())) != 0;
-    if (!isBinary && data.size() > kLongestXml)
+    if (!isBinary && !isReasonableXml(data))
         return std::nullopt;
     plist_t node = nullptr;
     const auto parse = isBinary ? plist_from_bin : plist_from_xml;

@@ -14,7 +14,9 @@ namespace ventras {
 std::optional<std::string> xmlPropertyList(const PropertyValue& value);
 
 /// Reads an XML or binary property list.
-/// @return absent when it does not parse or is longer than 512 KiB (binary: 128 KiB). Dates, data and real numbers are left out of their container.
+/// @return absent when it does not parse, is longer than 4 MiB (binary: 128 KiB), or has more than 65536
+/// arrays
+///         and dictionaries. Dates, data and real numbers are left out of their container.
 std::optional<PropertyValue> parsePropertyList(std::string_view data);
 
 }  // namespace ventras
