@@ -1,0 +1,57 @@
+#pragma once
+
+#include <mutex>
+#include <set>
+
+#include "platform/PrintSystemService.h"
+#include "platform/linux/SchedulerRequest.h"
+
+namespace ventras {
+
+class Log;
+class PlistPreferenceStore;
+class Scheduler;
+struct NewQueue;
+
+/// The print system as administration requests to a CUPS scheduler, the one of the user's libcups
+/// configuration. Every failure leaves one line in the log. Any thread may call; each call blocks.
+class CupsPrintSystem : public PrintSystemService {
+public:
+    /// The user's wish that each new queue becomes the default printer: a boolean of this domain and key.
+    static constexpr std::string_view kPreferenceDomain = "com.quillon.print";
+    static constexpr std::string_view kNewestIsDefault = "Newest Printer Is Default";
+
+    /// @param log, preferences outlive the print system
+    CupsPrintSystem(Log& log, const PlistPreferenceStore& preferences)
+        : log_(log), preferences_(preferences) {}
+
+    std::optional<std::string> suggestQueueName(const std::string& name, bool unique) override;
+    std::optional<std::string> copyLocalServerURL() override;
+    std::int32_t createQueue(const std::string& serverURL, const std::string& queueID,
+                             const std::string& attributes,
+                             const std::map<std::string, std::string>& options) override;
+    std::int32_t removeQueue(const std::string& queueID) override;
+    std::int32_t setDefaultPrinter(const std::string& queueID) override;
+    bool isFax(const std::string& queueID) override;
+    bool isScanner(const std::string& queueID) override;
+    std::optional<std::string> copyQueuePPD(const std::string& queueID) override;
+    std::int32_t setQueuePPD(const std::string& queueID, const std::string& ppdPath) override;
+    std::optional<std::string> copyLocalizedPPD(const std::string& ppdPath) override;
+    bool useLastPrinterAsCurrentPrinter() override;
+    AutoSelectCreation autoSelectCreateContext(const std::string& deviceURI) override;
+
+private:
+    std::optional<Refusal> create(const NewQueue& queue);
+    std::optional<Refusal> createUnchecked(Scheduler& scheduler, const NewQueue& queue, int ppd);
+    void rememberLeftover(const std::string& queueID);
+    bool isLeftover(const std::string& queueID);
+    void forgetLeftover(const std::string& queueID);
+    std::int32_t report(const std::string& what, const Refusal& refusal);
+
+    Log& log_;
+    const PlistPreferenceStore& preferences_;
+    std::mutex mutex_;
+    std::set<std::string> leftovers_;  // queues of failed creations that may still be there
+};
+
+}  // namespace ventras

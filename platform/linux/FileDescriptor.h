@@ -1,0 +1,31 @@
+#pragma once
+
+#include <unistd.h>
+
+#include <utility>
+
+namespace ventras {
+
+/// Owner of a file descriptor; -1 = none. Values move; one thread at a time.
+class FileDescriptor {
+public:
+    FileDescriptor() = default;
+    explicit FileDescriptor(int descriptor) : descriptor_(descriptor) {}
+    FileDescriptor(FileDescriptor&& other) noexcept : descriptor_(std::exchange(other.descriptor_, -1)) {}
+    FileDescriptor& operator=(FileDescriptor&& other) noexcept {
+        std::swap(descriptor_, other.descriptor_);
+        return *this;
+    }
+    ~FileDescriptor() {
+        if (descriptor_ >= 0)
+            ::close(descriptor_);
+    }
+
+    int get() const { return descriptor_; }
+    int release() { return std::exchange(descriptor_, -1); }
+
+private:
+    int descriptor_ = -1;
+};
+
+}  // namespace ventras
