@@ -22,12 +22,10 @@ constexpr const char* kNoSerialNumber = "(null)";  // queues made without a seri
 constexpr std::string_view kFaxResource = "ipp/faxout";
 constexpr std::int64_t kFaxPrinterType = 0x40000;  // CUPS_PRINTER_FAX
 
-template <typename... Values>
-std::string assembled(const char* scheme, const std::string& host, const char* resourceFormat,
-                      const Values&... values) {
+std::string assembled(const char* scheme, const std::string& host, const std::string& resource) {
     std::array<char, 1024> uri{};
-    httpAssembleURIf(HTTP_URI_CODING_ALL, uri.data(), static_cast<int>(uri.size()), scheme, nullptr,
-                     host.c_str(), 0, resourceFormat, values.c_str()...);
+    httpAssembleURI(HTTP_URI_CODING_ALL, uri.data(), static_cast<int>(uri.size()), scheme, nullptr,
+                    host.c_str(), 0, resource.c_str());
     return uri.data();
 }
 
@@ -109,9 +107,10 @@ bool IPPUSBObject::hasTXTValues() {
 std::vector<std::string> IPPUSBObject::uris() {
     if (!hasTXTValues())
         return {};
+    const auto model = trimmedValue("usb_MDL").value_or(kUnknown);
+    const auto serialNumber = txtValue("usb_SN").value_or(kNoSerialNumber);
     return {
-        assembled("usb", trimmedValue("usb_MFG").value_or(kUnknown), "/%s?serial=%s",
-                  trimmedValue("usb_MDL").value_or(kUnknown), txtValue("usb_SN").value_or(kNoSerialNumber)),
+        assembled("usb", trimmedValue("usb_MFG").value_or(kUnknown), "/" + model + "?serial=" + serialNumber),
         deviceURI().value_or("")};
 }
 
@@ -133,7 +132,7 @@ std::optional<std::string> IPPUSBObject::deviceURI() {
         return "";
     const auto host = registeredName() + "._ipp._tcp.local.";
     const auto uuid = txtValue("UUID");
-    return uuid ? assembled("ippusb", host, "/?uuid=%s", *uuid) : assembled("ippusb", host, "/");
+    return assembled("ippusb", host, uuid ? "/?uuid=" + *uuid : "/");
 }
 
 bool IPPUSBObject::matchesIDDevice(const ImageDevice& device) {
@@ -167,6 +166,12 @@ std::optional<QueueAttributes> IPPUSBObject::driverInfo(const PPDRecord&) {
 
 std::optional<std::vector<PPDRecord>> IPPUSBObject::driverList() {
     return std::vector{drivers_.genericURFPPD()};
+}
+
+std::optional<std::string> IPPUSBObject::difficulty() {
+    if (hasTXTValues())
+        return std::nullopt;
+    return "no service of its name is registered in DNS-SD on this machine, or none that tells anything";
 }
 
 std::string IPPUSBObject::description() const {

@@ -56,6 +56,7 @@ public:
 
     std::optional<QueueAttributes> driverInfo(const PPDRecord& driver) override;
     std::optional<std::vector<PPDRecord>> driverList() override;
+    std::optional<std::string> difficulty() override;
 
     /// For log lines.
     std::string description() const;

@@ -92,13 +92,13 @@ void PrinterWatch::appeared(const Service& service) {
 
 void PrinterWatch::resolved(const Service& service, std::uint16_t port) {
     ports_[service] = port;
-    for (const auto& [printer, printerPort] : ports_) {
+    for (const auto& entry : ports_) {
         const auto isUsbTwin = [&](const auto& other) {
-            return other.first.first == kUsbType && other.second == printerPort;
+            return other.first.first == kUsbType && other.second == entry.second;
         };
-        if (printer.first == kPrinterType && std::ranges::any_of(ports_, isUsbTwin) &&
-            announced_.insert(printer.second).second)
-            found_(printer.second);
+        const auto& [type, name] = entry.first;
+        if (type == kPrinterType && std::ranges::any_of(ports_, isUsbTwin) && announced_.insert(name).second)
+            found_(name);
     }
 }
 

@@ -5,9 +5,11 @@
 #include <spawn.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <csignal>
 #include <cstdio>
 #include <cstring>
+#include <iterator>
 #include <string>
 #include <vector>
 
@@ -18,8 +20,7 @@ namespace {
 void start(std::vector<std::string> command, const std::string& printer) {
     command.push_back("ippusb://" + printer);
     std::vector<char*> pointers;
-    for (auto& word : command)
-        pointers.push_back(word.data());
+    std::ranges::transform(command, std::back_inserter(pointers), [](auto& word) { return word.data(); });
     pointers.push_back(nullptr);
 
     sigset_t ignored;

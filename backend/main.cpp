@@ -1,0 +1,106 @@
+#include <cups/backend.h>
+#include <unistd.h>
+
+#include <chrono>
+#include <cstdio>
+#include <cstdlib>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <thread>
+
+#include "platform/Handles.h"
+#include "platform/IppConnection.h"
+#include "platform/linux/PrinterAddress.h"
+
+namespace ventras {
+namespace {
+
+constexpr std::chrono::seconds kRetryInterval{5};
+
+constexpr std::string_view kScheme = "ippusb://";
+
+// The scheduler's message for people says why a job waits; nothing in it comes from the device or the queue.
+constexpr const char* kAway =
+    "INFO: The printer is unplugged or switched off, or its IPP-over-USB service is not running.\n";
+
+void say(const char* line) {
+    std::fputs(line, stderr);
+}
+
+std::optional<std::string> environment(const char* name) {
+    const char* value = std::getenv(name);
+    return value == nullptr ? std::nullopt : std::optional<std::string>(value);
+}
+
+// Queues for sending faxes say so in their PPD.
+PrinterService serviceOfQueue() {
+    const auto file = environment("PPD");
+    const PpdPtr ppd{file ? ppdOpenFile(file->c_str()) : nullptr};
+    const auto* fax = ppd ? ppdFindAttr(ppd.get(), "cupsFax", nullptr) : nullptr;
+    const bool isFax = fax != nullptr && fax->value != nullptr && strcasecmp(fax->value, "True") == 0;
+    return isFax ? PrinterService::FaxOut : PrinterService::Print;
+}
+
+// A daemon that has just gone leaves its record behind for a moment, so only a port that answers counts.
+std::optional<PrinterAddress> findPrinter(const std::string& deviceURI, PrinterService service) {
+    auto address = PrinterAddress::find(deviceURI, service);
+    if (address && !IppConnection::toPrinter(address->host, address->port, HTTP_ENCRYPTION_NEVER).connected())
+        return std::nullopt;
+    return address;
+}
+
+// Waits for as long as it takes, as a job for a printer that is switched off should; the scheduler ends the
+// program when the job is cancelled. A member of a class gives the job back, for another member may be there.
+std::optional<PrinterAddress> waitForPrinter(const std::string& deviceURI, PrinterService service) {
+    auto address = findPrinter(deviceURI, service);
+    if (address)
+        return address;
+    say("STATE: +offline-report\n");
+    const bool isMemberOfClass = environment("CLASS").has_value();
+    do {
+        say(kAway);  // each time anew: the filters have messages of their own, and the last one is shown
+        std::this_thread::sleep_for(kRetryInterval);
+        address = findPrinter(deviceURI, service);
+    } while (!address && !isMemberOfClass);
+    if (address)
+        say("STATE: -offline-report\n");
+    return address;
+}
+
+// From here on the job is the stock IPP backend's, in this very process: data, signals and exit status are
+// its own.
+int becomeIppBackend(const std::string& uri, char* arguments[]) {
+    std::string address = uri;
+    arguments[0] = address.data();
+    setenv("DEVICE_URI", address.c_str(), 1);
+    const auto program = environment("CUPS_SERVERBIN").value_or(VENTRAS_CUPS_SERVERBIN) + "/backend/ipp";
+    execv(program.c_str(), arguments);
+    std::perror(("ERROR: Unable to start " + program).c_str());
+    return CUPS_BACKEND_FAILED;
+}
+
+int print(char* arguments[]) {
+    const auto deviceURI = environment("DEVICE_URI").value_or(arguments[0]);
+    if (!deviceURI.starts_with(kScheme)) {
+        say("ERROR: The queue's device URI is not one of a printer with IPP over USB.\n");
+        return CUPS_BACKEND_STOP;
+    }
+    const auto address = waitForPrinter(deviceURI, serviceOfQueue());
+    return address ? becomeIppBackend(address->uri, arguments) : CUPS_BACKEND_FAILED;
+}
+
+}  // namespace
+}  // namespace ventras
+
+int main(int argc, char* argv[]) {
+    if (argc == 1) {
+        std::puts("direct ippusb \"Unknown\" \"Printer with IPP over USB\"");
+        return CUPS_BACKEND_OK;
+    }
+    if (argc != 6 && argc != 7) {
+        std::fputs("ERROR: Usage: ippusb JOB USER TITLE COPIES OPTIONS [FILE]\n", stderr);
+        return CUPS_BACKEND_STOP;
+    }
+    return ventras::print(argv);
+}
