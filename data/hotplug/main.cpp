@@ -24,20 +24,13 @@ int attribute(const std::string& systemPath, const char* name) {
     return file >> value ? value : -1;
 }
 
-bool isPrinter(const LibusbInterface& interface) {
-    return std::ranges::any_of(interface.settings, [](const auto& setting) {
-        return setting.descriptor.bInterfaceClass == kUsbPrinterInterfaces.bInterfaceClass &&
-               setting.descriptor.bInterfaceSubClass == kUsbPrinterInterfaces.bInterfaceSubClass;
-    });
-}
-
 std::vector<std::string> agentArguments(const std::vector<LibusbDevicePtr>& devices, int bus, int number) {
     std::vector<std::string> arguments;
     for (const auto& device : devices)
         if (libusb_get_bus_number(device->device.get()) == bus &&
             libusb_get_device_address(device->device.get()) == number)
             for (const auto& interface : device->interfaces)
-                if (isPrinter(interface))
+                if (interface.hasSetting(kUsbPrinterInterfaces))
                     arguments.push_back("-u" + std::to_string(device->location) + "," +
                                         std::to_string(interface.number));
     return arguments;
