@@ -25,7 +25,8 @@ HttpGuard::HttpGuard(http_t* connection, Deadline deadline) : connection_(connec
 HttpGuard::~HttpGuard() {
     watcher_.request_stop();
     watcher_.join();
-    httpSetTimeout(connection_, 0.0, nullptr, nullptr);  // the deadline that waitOn() reads goes with the guard
+    httpSetTimeout(connection_, 0.0, nullptr,
+                   nullptr);  // the deadline that waitOn() reads goes with the guard
 }
 
 void HttpGuard::watch(const std::stop_token& stop) {

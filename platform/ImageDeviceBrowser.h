@@ -18,12 +18,12 @@ inline constexpr std::string_view kBluetooth = "Bluetooth";
 
 /// One scanner or multifunction device that the image-capture system announces.
 struct ImageDevice {
-    std::string transport;                  ///< one of ImageDeviceTransport
-    std::uint32_t usbLocation = 0;          ///< UsbRegistry's location; USB only
-    std::uint16_t usbVendor = 0;            ///< idVendor; USB only
-    std::uint16_t usbProduct = 0;           ///< idProduct; USB only
-    std::string serialNumber;               ///< empty when the device has none
-    std::string txtRecord;                  ///< raw bytes of the DNS-SD TXT record (RFC 6763 section 6); TCP/IP only
+    std::string transport;          ///< one of ImageDeviceTransport
+    std::uint32_t usbLocation = 0;  ///< UsbRegistry's location; USB only
+    std::uint16_t usbVendor = 0;    ///< idVendor; USB only
+    std::uint16_t usbProduct = 0;   ///< idProduct; USB only
+    std::string serialNumber;       ///< empty when the device has none
+    std::string txtRecord;          ///< raw bytes of the DNS-SD TXT record (RFC 6763 section 6); TCP/IP only
     std::string uuidString;
     std::optional<std::string> modulePath;  ///< the driver module that serves the device
 };

@@ -6,6 +6,7 @@
 
 #include <algorithm>
 #include <array>
+#include <atomic>
 #include <cerrno>
 
 #include "platform/ConnectFailure.h"
@@ -13,6 +14,10 @@
 
 namespace ventras {
 namespace {
+
+// The agent asks the scheduler several things, one after another and by many threads. One that hangs would
+// hold it for as many limits.
+std::atomic<bool> isSchedulerSilent = false;
 
 // libcups would ask on the terminal; an agent without windows has nobody to ask.
 const char* refusePassword(const char*, http_t*, const char*, const char*, void*) {
@@ -113,16 +118,17 @@ bool receiveDocument(http_t* http, int received) {
 
 IppConnection IppConnection::toPrinter(const std::string& host, int port, http_encryption_t encryption,
                                        std::chrono::milliseconds limit) {
-    return IppConnection{host, port, encryption, limit};
+    return IppConnection{Peer::Printer, host, port, encryption, limit};
 }
 
 IppConnection IppConnection::toScheduler(std::chrono::milliseconds limit) {
-    return IppConnection{cupsServer(), ippPort(), cupsEncryption(), limit};
+    return IppConnection{Peer::Scheduler, cupsServer(), ippPort(), cupsEncryption(),
+                         isSchedulerSilent ? std::min(limit, kImpatientLimit) : limit};
 }
 
-IppConnection::IppConnection(const std::string& host, int port, http_encryption_t encryption,
+IppConnection::IppConnection(Peer peer, const std::string& host, int port, http_encryption_t encryption,
                              std::chrono::milliseconds limit)
-    : limit_(limit) {
+    : peer_(peer), limit_(limit) {
     constexpr int kConnectLater = 0;
     http_.reset(httpConnect2(host.c_str(), port, nullptr, AF_UNSPEC, encryption, 1, kConnectLater, nullptr));
     if (!http_) {
@@ -148,8 +154,19 @@ IppAnswer IppConnection::exchange(IppPtr request, const std::string& resource, i
     if (!http_)
         return {nullptr, IPP_STATUS_ERROR_SERVICE_UNAVAILABLE, failure_};
 
-    cupsSetPasswordCB2(refusePassword, nullptr);
     const auto deadline = Deadline::after(limit_);
+    auto answer = exchangeBy(deadline, std::move(request), resource, document, received);
+    const bool isOverdue = !answer.succeeded() && deadline.passed();
+    if (peer_ == Peer::Scheduler)
+        isSchedulerSilent = isOverdue;
+    if (isOverdue)
+        return {nullptr, IPP_STATUS_ERROR_INTERNAL, "no complete answer within " + seconds(limit_)};
+    return answer;
+}
+
+IppAnswer IppConnection::exchangeBy(Deadline deadline, IppPtr request, const std::string& resource,
+                                    int document, int received) {
+    cupsSetPasswordCB2(refusePassword, nullptr);
     const HttpGuard guard(http_.get(), deadline);
     IppPtr response;
     for (int i = 0; i < kMostAttempts && !response; ++i) {
@@ -164,8 +181,6 @@ IppAnswer IppConnection::exchange(IppPtr request, const std::string& resource, i
         answer = {nullptr, IPP_STATUS_ERROR_INTERNAL, "the document that came back is incomplete"};
     if (httpGetState(http_.get()) != HTTP_STATE_WAITING)
         httpFlush(http_.get());
-    if (!answer.succeeded() && deadline.passed())
-        return {nullptr, IPP_STATUS_ERROR_INTERNAL, "no complete answer within " + seconds(limit_)};
     return answer;
 }
 

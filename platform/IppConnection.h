@@ -29,6 +29,7 @@ public:
     /// Longest time for one whole exchange with a printer, and with the scheduler.
     static constexpr std::chrono::milliseconds kPrinterLimit = std::chrono::seconds(30);
     static constexpr std::chrono::milliseconds kSchedulerLimit = std::chrono::seconds(120);
+    static constexpr std::chrono::milliseconds kImpatientLimit = std::chrono::seconds(5);
 
     /// Connects to any address of `host`, an IPv6 literal without brackets included.
     /// @param port TCP port; 443 always means TLS
@@ -36,7 +37,8 @@ public:
     static IppConnection toPrinter(const std::string& host, int port, http_encryption_t encryption,
                                    std::chrono::milliseconds limit = kPrinterLimit);
 
-    /// Connects to the scheduler of the user's libcups configuration.
+    /// Connects to the scheduler of the user's libcups configuration. A scheduler that has just kept somebody
+    /// in this process waiting for a whole limit has kImpatientLimit for an answer, until it gives one again.
     static IppConnection toScheduler(std::chrono::milliseconds limit = kSchedulerLimit);
 
     /// Whether the peer was reached.
@@ -54,8 +56,14 @@ public:
     IppAnswer exchange(IppPtr request, const std::string& resource, int document = -1, int received = -1);
 
 private:
-    IppConnection(const std::string& host, int port, http_encryption_t encryption, std::chrono::milliseconds limit);
+    enum class Peer { Printer, Scheduler };
 
+    IppConnection(Peer peer, const std::string& host, int port, http_encryption_t encryption,
+                  std::chrono::milliseconds limit);
+    IppAnswer exchangeBy(Deadline deadline, IppPtr request, const std::string& resource, int document,
+                         int received);
+
+    Peer peer_;
     HttpPtr http_;
     std::string failure_;
     std::chrono::milliseconds limit_;

@@ -14,7 +14,9 @@ public:
     virtual void main() = 0;
 
     /// Makes this operation wait until `operation` has finished. Call it before this operation is queued.
-    void addDependency(std::shared_ptr<Operation> operation) { dependencies_.push_back(std::move(operation)); }
+    void addDependency(std::shared_ptr<Operation> operation) {
+        dependencies_.push_back(std::move(operation));
+    }
 
     const std::vector<std::shared_ptr<Operation>>& dependencies() const { return dependencies_; }
 

@@ -30,8 +30,8 @@ bool OperationQueue::isReady(const Operation& operation) const {
 }
 
 void OperationQueue::promoteReadyOperations() {
-    const auto firstReady = std::stable_partition(waiting_.begin(), waiting_.end(),
-                                                  [this](const auto& operation) { return !isReady(*operation); });
+    const auto firstReady = std::stable_partition(
+        waiting_.begin(), waiting_.end(), [this](const auto& operation) { return !isReady(*operation); });
     std::move(firstReady, waiting_.end(), std::back_inserter(ready_));
     waiting_.erase(firstReady, waiting_.end());
     startWorkers();

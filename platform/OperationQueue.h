@@ -17,7 +17,8 @@ namespace ventras {
 /// Runs operations on worker threads, each after its dependencies.
 ///
 /// There are as many workers as operations are ready, up to kMostWorkers: they wait for networks, not for the
-/// processor. Operations may be added from any thread. An exception that leaves an operation ends the process.
+/// processor. Operations may be added from any thread. An exception that leaves an operation ends the
+/// process.
 class OperationQueue {
 public:
     static constexpr std::size_t kMostWorkers = 64;

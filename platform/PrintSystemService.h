@@ -9,11 +9,11 @@
 
 namespace ventras {
 
-/// The print system's own failures. They double as exit statuses, so each has non-zero low eight bits and none
-/// is a status of the agent's own; the numbers follow sysexits.h.
+/// The print system's own failures. They double as exit statuses, so each has non-zero low eight bits and
+/// none is a status of the agent's own; the numbers follow sysexits.h.
 namespace PrintSystemStatus {
 inline constexpr std::int32_t kSuccess = 0;
-inline constexpr std::int32_t kBadData = 65;       ///< queue attributes or PPD that must not reach the scheduler
+inline constexpr std::int32_t kBadData = 65;  ///< queue attributes or PPD that must not reach the scheduler
 inline constexpr std::int32_t kUnavailable = 69;   ///< the scheduler, or the printer asked, did not answer
 inline constexpr std::int32_t kCannotCreate = 73;  ///< the scheduler refused the queue, or made a raw one
 inline constexpr std::int32_t kNoPermission = 77;  ///< the scheduler does not let this user administer it
@@ -21,8 +21,9 @@ inline constexpr std::int32_t kNoPermission = 77;  ///< the scheduler does not l
 
 /// What auto-selection learnt about a device.
 struct AutoSelectInfo {
-    std::optional<std::string> product{};  ///< the device's own product text, e.g. a PostScript product string
-    bool isBinaryOK = false;             ///< whether the channel takes binary data
+    std::optional<std::string>
+        product{};            ///< the device's own product text, e.g. a PostScript product string
+    bool isBinaryOK = false;  ///< whether the channel takes binary data
 };
 
 /// One device being asked which driver and which installable options suit it; released with the object.
@@ -41,7 +42,8 @@ public:
     /// @return 0 on success, also when nothing was to be chosen.
     virtual std::int32_t autoSelectInstallableOptions(const std::string& ppdPath) = 0;
 
-    /// "file://" URL of a new PPD with the options chosen; the caller deletes the file. Absent = use the old one.
+    /// "file://" URL of a new PPD with the options chosen; the caller deletes the file. Absent = use the old
+    /// one.
     virtual std::optional<std::string> autoSelectHasNewPPD() const = 0;
 };
 
@@ -82,8 +84,8 @@ public:
     virtual bool isFax(const std::string& queueID) = 0;
     virtual bool isScanner(const std::string& queueID) = 0;
 
-    /// Copies an existing queue's PPD. @return path of a new temporary file that the caller deletes; absent when
-    /// the queue has none, or the scheduler does not hand it out.
+    /// Copies an existing queue's PPD. @return path of a new temporary file that the caller deletes; absent
+    /// when the queue has none, or the scheduler does not hand it out.
     virtual std::optional<std::string> copyQueuePPD(const std::string& queueID) = 0;
 
     /// Installs a PPD file as an existing queue's driver. @return 0 on success.

@@ -13,7 +13,8 @@ struct PrintToolAgentReply {
     PropertyDictionary dictionary;  ///< e.g. "count", "conflicts", "is_cache_current"
 };
 
-/// Synchronous commands to the agent service of the printing user-interface tool. Any thread may send; it blocks.
+/// Synchronous commands to the agent service of the printing user-interface tool. Any thread may send; it
+/// blocks.
 class PrintToolAgentChannel {
 public:
     static constexpr std::string_view kService = "com.quillon.lorvextool.agent";

@@ -96,7 +96,7 @@ std::optional<Refusal> CupsPrintSystem::create(const NewQueue& queue) {
         return cannotCreate("a queue of this name exists");
 
     rememberLeftover(queue.queueID);
-    auto refusal = createUnchecked(scheduler, queue, ppd.descriptor());
+    auto refusal = createUnchecked(scheduler, queue, ppd);
     // A queue that does not work is worse than none; if the scheduler keeps it now, removeQueue() tries
     // again.
     if (!refusal || !scheduler.deleteQueue(queue.queueID))
@@ -105,14 +105,35 @@ std::optional<Refusal> CupsPrintSystem::create(const NewQueue& queue) {
 }
 
 std::optional<Refusal> CupsPrintSystem::createUnchecked(Scheduler& scheduler, const NewQueue& queue,
-                                                        int ppd) {
-    if (auto refusal = scheduler.addQueue(queue, ppd))
+                                                        const PpdFile& ppd) {
+    if (auto refusal = scheduler.addQueue(queue, ppd.descriptor()))
         return refusal;
     const auto made = scheduler.queueState(queue.queueID);
     if (const auto* refusal = std::get_if<Refusal>(&made))
         return *refusal;
     const auto& state = std::get<std::optional<QueueState>>(made);
-    return state ? objectionToResult(queue, *state) : cannotCreate("the scheduler lost the new queue");
+    if (!state)
+        return cannotCreate("the scheduler lost the new queue");
+    if (auto refusal = objectionToResult(queue, *state))
+        return refusal;
+    rememberOwn(queue.queueID, {state->isFax(), ppd.isScannerOnly()});
+    return std::nullopt;
+}
+
+std::optional<CupsPrintSystem::QueueKind> CupsPrintSystem::kindOfOwn(const std::string& queueID) {
+    const std::lock_guard lock(mutex_);
+    const auto own = made_.find(queueID);
+    return own == made_.end() ? std::nullopt : std::optional{own->second};
+}
+
+void CupsPrintSystem::rememberOwn(const std::string& queueID, QueueKind kind) {
+    const std::lock_guard lock(mutex_);
+    made_.insert_or_assign(queueID, kind);
+}
+
+void CupsPrintSystem::forgetOwn(const std::string& queueID) {
+    const std::lock_guard lock(mutex_);
+    made_.erase(queueID);
 }
 
 void CupsPrintSystem::rememberLeftover(const std::string& queueID) {
@@ -147,6 +168,8 @@ std::int32_t CupsPrintSystem::setDefaultPrinter(const std::string& queueID) {
 }
 
 bool CupsPrintSystem::isFax(const std::string& queueID) {
+    if (const auto own = kindOfOwn(queueID))
+        return own->isFax;
     const auto state = Scheduler().queueState(queueID);
     if (const auto* refusal = std::get_if<Refusal>(&state)) {
         report(queueText(queueID) + " does not tell whether it is a fax", *refusal);
@@ -157,6 +180,8 @@ bool CupsPrintSystem::isFax(const std::string& queueID) {
 }
 
 bool CupsPrintSystem::isScanner(const std::string& queueID) {
+    if (const auto own = kindOfOwn(queueID))
+        return own->isScanner;
     const auto ppd = Scheduler().fetchPPD(queueID);
     if (const auto* refusal = std::get_if<Refusal>(&ppd)) {
         report(queueText(queueID) + " does not tell whether it is a scanner", *refusal);
@@ -184,6 +209,7 @@ std::int32_t CupsPrintSystem::setQueuePPD(const std::string& queueID, const std:
     const auto replacement = PpdFile::open(ppdPath);
     if (auto objection = objectionToReplacement(present, replacement))
         return report(what, {PrintSystemStatus::kBadData, std::move(*objection)});
+    forgetOwn(queueID);
     const auto refusal = scheduler.replacePPD(queueID, replacement.descriptor());
     return refusal ? report(what, *refusal) : PrintSystemStatus::kSuccess;
 }

@@ -1,7 +1,11 @@
 #pragma once
 
+#include <map>
 #include <mutex>
+#include <optional>
 #include <set>
+#include <string>
+#include <string_view>
 
 #include "platform/PrintSystemService.h"
 #include "platform/linux/SchedulerRequest.h"
@@ -10,6 +14,7 @@ namespace ventras {
 
 class Log;
 class PlistPreferenceStore;
+class PpdFile;
 class Scheduler;
 struct NewQueue;
 
@@ -42,7 +47,15 @@ public:
 
 private:
     std::optional<Refusal> create(const NewQueue& queue);
-    std::optional<Refusal> createUnchecked(Scheduler& scheduler, const NewQueue& queue, int ppd);
+    std::optional<Refusal> createUnchecked(Scheduler& scheduler, const NewQueue& queue, const PpdFile& ppd);
+    struct QueueKind {
+        bool isFax = false;
+        bool isScanner = false;
+    };
+
+    std::optional<QueueKind> kindOfOwn(const std::string& queueID);
+    void rememberOwn(const std::string& queueID, QueueKind kind);
+    void forgetOwn(const std::string& queueID);
     void rememberLeftover(const std::string& queueID);
     bool isLeftover(const std::string& queueID);
     void forgetLeftover(const std::string& queueID);
@@ -51,7 +64,8 @@ private:
     Log& log_;
     const PlistPreferenceStore& preferences_;
     std::mutex mutex_;
-    std::set<std::string> leftovers_;  // queues of failed creations that may still be there
+    std::set<std::string> leftovers_;        // queues of failed creations that may still be there
+    std::map<std::string, QueueKind> made_;  // the others, so that nobody need be asked what they are
 };
 
 }  // namespace ventras

@@ -21,14 +21,19 @@ using Generate = decltype(&ppdCreateFromIPP);
 // With all that it depends on, this library takes longer to load than the rest of the program together; runs
 // for printers that do not speak IPP, or that have a queue already, do without it.
 Generate loadGenerator() {
-    void* library = dlopen("libcupsfilters.so.1", RTLD_NOW | RTLD_LOCAL);
+    void* library = dlopen("libcupsfilters.so.1", RTLD_LAZY | RTLD_LOCAL);
     return library == nullptr ? nullptr : reinterpret_cast<Generate>(dlsym(library, "ppdCreateFromIPP"));
+}
+
+Generate loadedGenerator() {
+    static const Generate generator = loadGenerator();
+    return generator;
 }
 
 std::optional<TemporaryFile> generate(ipp_t* capabilities) {
     static std::mutex oneAtATime;  // the generator keeps its last message in a global variable
     const std::lock_guard lock(oneAtATime);
-    static const Generate generator = loadGenerator();
+    const Generate generator = loadedGenerator();
     std::array<char, 1024> path{};
     if (generator == nullptr ||
         generator(path.data(), path.size(), capabilities, nullptr, nullptr, 0, 0) == nullptr ||
@@ -59,6 +64,10 @@ bool correct(const std::string& path, PrinterService service) {
 }
 
 }  // namespace
+
+void loadPPDGenerator() {
+    loadedGenerator();
+}
 
 std::variant<TemporaryFile, std::string> driverlessPPD(ipp_t* capabilities, PrinterService service) {
     auto file = generate(capabilities);

@@ -77,6 +77,15 @@ LibusbDevicePtr describe(libusb_device* device) {
 
 }  // namespace
 
+bool LibusbSetting::matches(const UsbInterfaceMatch& match) const {
+    return descriptor.bInterfaceClass == match.bInterfaceClass &&
+           descriptor.bInterfaceSubClass == match.bInterfaceSubClass;
+}
+
+bool LibusbInterface::hasSetting(const UsbInterfaceMatch& match) const {
+    return std::ranges::any_of(settings, [&](const auto& setting) { return setting.matches(match); });
+}
+
 const LibusbSetting* LibusbInterface::setting(std::uint8_t alternate) const {
     const auto found = std::ranges::find_if(
         settings, [=](const auto& setting) { return setting.descriptor.bAlternateSetting == alternate; });

@@ -26,12 +26,17 @@ struct LibusbSetting {
     UsbInterfaceDescriptor descriptor;
     std::optional<std::uint8_t> bulkOut;  ///< address of its first bulk endpoint to the device
     std::optional<std::uint8_t> bulkIn;   ///< and from it
+
+    bool matches(const UsbInterfaceMatch& match) const;
 };
 
 /// One interface with all its settings, in the order of the configuration.
 struct LibusbInterface {
     std::uint8_t number = 0;
     std::vector<LibusbSetting> settings;
+
+    /// Whether one of the settings, current or not, is of that class.
+    bool hasSetting(const UsbInterfaceMatch& match) const;
 
     /// Null when there is none of that number.
     const LibusbSetting* setting(std::uint8_t alternate) const;

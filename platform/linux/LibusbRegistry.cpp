@@ -54,11 +54,6 @@ const InterfaceHandle& own(const UsbInterfaceHandle& interface) {
     return static_cast<const InterfaceHandle&>(interface);
 }
 
-bool matches(const LibusbSetting& setting, const UsbInterfaceMatch& match) {
-    return setting.descriptor.bInterfaceClass == match.bInterfaceClass &&
-           setting.descriptor.bInterfaceSubClass == match.bInterfaceSubClass;
-}
-
 const LibusbSetting* currentSetting(const UsbInterfaceHandle& interface) {
     const auto& place = own(interface).place;
     return place.interface->setting(place.device->currentSetting(place.interface->number));
@@ -107,8 +102,7 @@ std::unique_ptr<UsbInterfaceIterator> LibusbRegistry::matchingInterfaces(const U
     std::vector<Place> places;
     for (const auto& device : *devices)
         for (const auto& interface : device->interfaces)
-            if (std::ranges::any_of(interface.settings,
-                                    [&](const auto& each) { return matches(each, match); }))
+            if (interface.hasSetting(match))
                 places.push_back({device, &interface, match});
     return std::make_unique<Iterator>(std::move(places));
 }
@@ -169,9 +163,9 @@ std::optional<std::uint8_t> LibusbRegistry::alternateSetting(const UsbInterfaceH
     const auto& place = own(interface).place;
     const auto* current = currentSetting(interface);
     // usbfs only lets requests of the printer class through that name a setting of that class.
-    if (place.match && (current == nullptr || !matches(*current, *place.match)))
+    if (place.match && (current == nullptr || !current->matches(*place.match)))
         for (const auto& setting : place.interface->settings)
-            if (matches(setting, *place.match))
+            if (setting.matches(*place.match))
                 return setting.descriptor.bAlternateSetting;
     return current == nullptr ? std::nullopt : std::optional{current->descriptor.bAlternateSetting};
 }

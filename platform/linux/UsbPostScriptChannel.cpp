@@ -24,8 +24,10 @@ constexpr std::string_view kUniversalExit = "\x1b%-12345X";
 constexpr std::string_view kEnterPostScript = "@PJL ENTER LANGUAGE=POSTSCRIPT\r\n";
 
 bool namesIgnoringCase(std::string_view text, std::string_view upperCaseWord) {
-    const auto upper = [](char c) { return c >= 'a' && c <= 'z' ? static_cast<char>(c - 'a' + 'A') : c; };
-    return !std::ranges::search(text, upperCaseWord, {}, upper).empty();
+    const auto isSame = [](char c, char upperCase) {
+        return (c >= 'a' && c <= 'z' ? static_cast<char>(c - 'a' + 'A') : c) == upperCase;
+    };
+    return std::search(text.begin(), text.end(), upperCaseWord.begin(), upperCaseWord.end(), isSame) != text.end();
 }
 
 /// Whether a command set names PostScript, e.g. "PCL,PostScript" or "PJL,PS".

@@ -60,13 +60,10 @@ std::optional<Wanted> wantedBy(const std::string& deviceURI) {
 }
 
 const LibusbSetting* bidirectionalSetting(const LibusbInterface& interface) {
-    for (const auto& setting : interface.settings) {
-        const auto& descriptor = setting.descriptor;
-        if (descriptor.bInterfaceClass == kUsbPrinterInterfaces.bInterfaceClass &&
-            descriptor.bInterfaceSubClass == kUsbPrinterInterfaces.bInterfaceSubClass &&
-            descriptor.bInterfaceProtocol == kBidirectional && setting.bulkIn && setting.bulkOut)
+    for (const auto& setting : interface.settings)
+        if (setting.matches(kUsbPrinterInterfaces) &&
+            setting.descriptor.bInterfaceProtocol == kBidirectional && setting.bulkIn && setting.bulkOut)
             return &setting;
-    }
     return nullptr;
 }
 
@@ -161,11 +158,8 @@ std::variant<UsbPrinterPlace, std::string> findUsbPrinter(LibusbContext& context
     std::string reason = "it is not attached";
     for (const auto& device : *devices)
         for (const auto& interface : device->interfaces) {
-            const auto isPrinter = std::ranges::any_of(interface.settings, [](const auto& setting) {
-                return setting.descriptor.bInterfaceClass == kUsbPrinterInterfaces.bInterfaceClass &&
-                       setting.descriptor.bInterfaceSubClass == kUsbPrinterInterfaces.bInterfaceSubClass;
-            });
-            if (!isPrinter || (wanted->location && device->location != *wanted->location))
+            if (!interface.hasSetting(kUsbPrinterInterfaces) ||
+                (wanted->location && device->location != *wanted->location))
                 continue;
             auto verdict = examine(device, interface, *wanted);
             if (auto* candidate = std::get_if<Candidate>(&verdict))

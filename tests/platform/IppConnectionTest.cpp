@@ -332,6 +332,21 @@ TEST_P(SchedulerConnections, SurviveARestart) {
     EXPECT_TRUE(connection.exchange(queuesRequest(), "/").succeeded());
 }
 
+TEST(SchedulerConnection, DoesNotWaitAsLongAgainForAFrozenOne) {
+    PrivateScheduler scheduler;
+    const UseScheduler use(scheduler);
+    scheduler.suspend();
+    EXPECT_FALSE(IppConnection::toScheduler(200ms).exchange(queuesRequest(), "/").succeeded());
+    const auto begin = std::chrono::steady_clock::now();
+    EXPECT_FALSE(IppConnection::toScheduler(60s).exchange(queuesRequest(), "/").succeeded());
+    EXPECT_LT(std::chrono::steady_clock::now() - begin, 20s);
+
+    scheduler.resume();
+    scheduler.addQueue("Q", "usb://Acme/ColorJet");
+    EXPECT_TRUE(IppConnection::toScheduler(60s).exchange(queuesRequest(), "/").succeeded());
+    EXPECT_TRUE(IppConnection::toScheduler(60s).exchange(queuesRequest(), "/").succeeded());
+}
+
 TEST_P(SchedulerConnections, DoNotWaitForAFrozenOne) {
     PrivateScheduler scheduler({.listensOnTcp = GetParam()});
     const UseScheduler use(scheduler);

@@ -12,6 +12,7 @@
 #include <tuple>
 #include <vector>
 
+#include "platform/linux/ReleaseWith.h"
 #include "platform/linux/scanners/NetworkScannerWatch.h"
 
 namespace ventras {
@@ -35,16 +36,9 @@ private:
     // Interface, protocol, name and type.
     using Registration = std::tuple<AvahiIfIndex, AvahiProtocol, std::string, std::string>;
 
-    template <auto release>
-    struct Release {
-        template <class Handle>
-        void operator()(Handle* handle) const {
-            release(handle);
-        }
-    };
-    using ClientPtr = std::unique_ptr<AvahiClient, Release<avahi_client_free>>;
-    using BrowserPtr = std::unique_ptr<AvahiServiceBrowser, Release<avahi_service_browser_free>>;
-    using ResolverPtr = std::unique_ptr<AvahiServiceResolver, Release<avahi_service_resolver_free>>;
+    using ClientPtr = std::unique_ptr<AvahiClient, ReleaseWith<avahi_client_free>>;
+    using BrowserPtr = std::unique_ptr<AvahiServiceBrowser, ReleaseWith<avahi_service_browser_free>>;
+    using ResolverPtr = std::unique_ptr<AvahiServiceResolver, ReleaseWith<avahi_service_resolver_free>>;
 
     static void onState(AvahiClient* client, AvahiClientState state, void* self);
     static void onService(AvahiServiceBrowser* browser, AvahiIfIndex interface, AvahiProtocol protocol,

@@ -17,25 +17,18 @@
 #include <vector>
 
 #include "platform/UsbLocation.h"
+#include "platform/linux/ReleaseWith.h"
 #include "platform/linux/scanners/NameBasedUUID.h"
 #include "platform/linux/scanners/ScannerModules.h"
 
 namespace ventras {
 namespace {
 
-template <auto release>
-struct Release {
-    template <class Handle>
-    void operator()(Handle* handle) const {
-        release(handle);
-    }
-};
-
-using UdevPtr = std::unique_ptr<udev, Release<udev_unref>>;
-using MonitorPtr = std::unique_ptr<udev_monitor, Release<udev_monitor_unref>>;
-using DevicePtr = std::unique_ptr<udev_device, Release<udev_device_unref>>;
-using EnumeratePtr = std::unique_ptr<udev_enumerate, Release<udev_enumerate_unref>>;
-using HwdbPtr = std::unique_ptr<udev_hwdb, Release<udev_hwdb_unref>>;
+using UdevPtr = std::unique_ptr<udev, ReleaseWith<udev_unref>>;
+using MonitorPtr = std::unique_ptr<udev_monitor, ReleaseWith<udev_monitor_unref>>;
+using DevicePtr = std::unique_ptr<udev_device, ReleaseWith<udev_device_unref>>;
+using EnumeratePtr = std::unique_ptr<udev_enumerate, ReleaseWith<udev_enumerate_unref>>;
+using HwdbPtr = std::unique_ptr<udev_hwdb, ReleaseWith<udev_hwdb_unref>>;
 
 constexpr const char* kSubsystem = "usb";
 constexpr const char* kDeviceType = "usb_device";
