@@ -191,13 +191,13 @@ FakePrinter& UsbBench::plugIn(const std::string& place, FakePrinterModel model) 
     const auto configuration = printer->configurationDescriptor();
     descriptors.insert(descriptors.end(), configuration.begin(), configuration.end());
     const auto number = made.configuration == 0 ? "" : std::to_string(made.configuration);
-    const auto nodePath =
-        add(place, descriptors,
-            "E: ID_USB_INTERFACES=" + interfaceList(made) + "\n" +
-                (made.isScanner ? "E: libsane_matched=yes\n" : "") + "A: bConfigurationValue=" + number + "\\n\n" +
-                attribute("idVendor", identifier(made.vendor)) + attribute("idProduct", identifier(made.product)) +
-                attribute("manufacturer", made.manufacturer) + attribute("product", made.productName) +
-                attribute("serial", made.serialNumber));
+    const auto nodePath = add(
+        place, descriptors,
+        "E: ID_USB_INTERFACES=" + interfaceList(made) + "\n" +
+            (made.isScanner ? "E: libsane_matched=yes\n" : "") + "A: bConfigurationValue=" + number +
+            "\\n\n" + attribute("idVendor", identifier(made.vendor)) +
+            attribute("idProduct", identifier(made.product)) + attribute("manufacturer", made.manufacturer) +
+            attribute("product", made.productName) + attribute("serial", made.serialNumber));
     auto interfaces = addInterfaces(place, *printer);
 
     auto node = std::make_unique<UsbNode>(*printer);

@@ -163,19 +163,35 @@ TEST_F(CupsPrintSystemTest, LeavesAClassOfTheNameAlone) {
 }
 
 TEST_F(CupsPrintSystemTest, KnowsAFaxQueue) {
-    ASSERT_EQ(create("Fax", kDevice, driverlessPpdText() + "*cupsFax: True\n"), 0);
+    const auto faxPpd = driverlessPpdText() + "*cupsFax: True\n";
+    scheduler_.addQueue("TheirFax", kDevice, faxPpd);
+    scheduler_.addQueue("Theirs", kDevice, driverlessPpdText());
+    ASSERT_EQ(create("Fax", kDevice, faxPpd), 0);
     ASSERT_EQ(create("Laser"), 0);
-    EXPECT_TRUE(printSystem_.isFax("Fax"));
-    EXPECT_FALSE(printSystem_.isFax("Laser"));
-    EXPECT_FALSE(printSystem_.isFax("None"));
+    for (const auto* queue : {"Fax", "TheirFax"})
+        EXPECT_TRUE(printSystem_.isFax(queue)) << queue;
+    for (const auto* queue : {"Laser", "Theirs", "None"})
+        EXPECT_FALSE(printSystem_.isFax(queue)) << queue;
 }
 
 TEST_F(CupsPrintSystemTest, KnowsAScannerQueue) {
+    scheduler_.addQueue("TheirScanner", "usb://other-uuid", scannerPpdText());
+    scheduler_.addQueue("Theirs", kDevice, driverlessPpdText());
     ASSERT_EQ(create("Scanner", "usb://some-uuid", scannerPpdText(), {{"Scanner", true}}), 0);
     ASSERT_EQ(create("Laser"), 0);
-    EXPECT_TRUE(printSystem_.isScanner("Scanner"));
-    EXPECT_FALSE(printSystem_.isScanner("Laser"));
-    EXPECT_FALSE(printSystem_.isScanner("None"));
+    for (const auto* queue : {"Scanner", "TheirScanner"})
+        EXPECT_TRUE(printSystem_.isScanner(queue)) << queue;
+    for (const auto* queue : {"Laser", "Theirs", "None"})
+        EXPECT_FALSE(printSystem_.isScanner(queue)) << queue;
+}
+
+TEST_F(CupsPrintSystemTest, SeesThatAReplacedPpdMakesAnotherKindOfQueue) {
+    ASSERT_EQ(create("Laser"), 0);
+    EXPECT_FALSE(printSystem_.isFax("Laser"));
+    ASSERT_EQ(printSystem_.setQueuePPD(
+                  "Laser", folder_.write("new.ppd", driverlessPpdText() + "*cupsFax: True\n").string()),
+              0);
+    EXPECT_TRUE(printSystem_.isFax("Laser"));
 }
 
 TEST_F(CupsPrintSystemTest, MakesAQueueTheDefault) {

@@ -66,8 +66,7 @@ UsbControlRequest getDeviceID(std::uint16_t length = 256, std::chrono::milliseco
     return request;
 }
 
-// Listing
-// --------------------------------------------------------------------------------------------------------
+// Listing -----------------------------------------------------------------------------------------
 
 TEST_F(Libusb, FindsNothingWhereNothingIs) {
     EXPECT_THAT(places(), IsEmpty());
@@ -136,8 +135,7 @@ TEST_F(Libusb, OpensOnlyTheDeviceThatIsAskedAndClosesItAgain) {
     EXPECT_EQ(bench.node("1-1").openAtPresent(), 0);
 }
 
-// What an interface is
-// -------------------------------------------------------------------------------------------
+// What an interface is ----------------------------------------------------------------------------
 
 TEST_F(Libusb, TellsWhatAnInterfaceIs) {
     bench.plugIn("1-1", {.vendor = 1008, .product = 17, .settings = {{3, 0, 7, 1, 2}}, .configuration = 2});
@@ -192,8 +190,7 @@ TEST_F(Libusb, ListsEveryInterfaceOfADevice) {
     EXPECT_THAT(numbers, ElementsAre(0, 1, 4));
 }
 
-// Requests
-// -------------------------------------------------------------------------------------------------------
+// Requests ----------------------------------------------------------------------------------------
 
 TEST_F(Libusb, ReadsTheDeviceIDWhileTheKernelsDriverHasThePrinter) {
     bench.plugIn("1-1");
@@ -322,8 +319,7 @@ TEST(LibusbAccess, DeniedLeavesAPrinterListedButSilent) {
         EXPECT_EXIT(_exit(lookAtForbiddenPrinterAsNobody(mode)), testing::ExitedWithCode(0), "");
 }
 
-// Against the registry in memory
-// ---------------------------------------------------------------------------------
+// Against the registry in memory ------------------------------------------------------------------
 
 /// A printer out of a seed: interfaces, settings, IDs and strings in all combinations.
 FakePrinterModel randomModel(std::mt19937& random) {

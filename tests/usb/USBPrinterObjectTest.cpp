@@ -2,9 +2,9 @@
 
 #include <gmock/gmock.h>
 
-#include <filesystem>
 #include <fstream>
 #include <string>
+#include <vector>
 
 #include "drivers/PPDManager.h"
 #include "platform/ImageDeviceBrowser.h"
@@ -17,8 +17,6 @@ namespace ventras {
 namespace {
 
 using namespace std::string_literals;
-using testing::ElementsAre;
-using testing::Key;
 using testing::Optional;
 
 constexpr std::uint32_t kPlace = 0xfa130000;
@@ -90,8 +88,12 @@ TEST_F(UsbPrinter, WithoutADeviceIDIsUnknown) {
     EXPECT_FALSE(nothing.supportsPCL());
 }
 
-// Device URI
-// -----------------------------------------------------------------------------------------------------
+TEST_F(UsbPrinter, HasAnEmptyListOfDriversWhenNothingFits) {
+    const UseScheduler nobody(folder / "no-scheduler");
+    EXPECT_EQ(printer("MFG:HP;MDL:LaserJet 1020;").driverList(), std::vector<PPDRecord>{});
+}
+
+// Device URI --------------------------------------------------------------------------------------
 
 struct UriCase {
     std::string deviceID;
@@ -124,8 +126,7 @@ TEST_F(UsbPrinter, WithTextTooLongForAUriHasAnEmptyOne) {
     EXPECT_EQ(uri("MFG:" + std::string(2000, 'x') + ";MDL:A;SN:1;"), "");
 }
 
-// The same device?
-// -----------------------------------------------------------------------------------------------
+// The same device? --------------------------------------------------------------------------------
 
 struct ImageDeviceCase {
     std::string transport;
@@ -159,8 +160,7 @@ TEST_F(UsbPrinter, IsTheImageDeviceOfTheSamePlaceProductAndVendor) {
     }
 }
 
-// Existing queues
-// ------------------------------------------------------------------------------------------------
+// Existing queues ---------------------------------------------------------------------------------
 
 const std::string kLaser = "MFG:HP;MDL:LaserJet 1020;SN:ABC;";
 
@@ -199,8 +199,7 @@ TEST_F(UsbPrinter, WithoutAUriIsServedByNoQueue) {
         std::nullopt);
 }
 
-// Attributes of a new queue
-// --------------------------------------------------------------------------------------
+// Attributes of a new queue -----------------------------------------------------------------------
 
 TEST_F(UsbPrinter, DescribesItsQueue) {
     EXPECT_EQ(driverInfo(kLaser), (QueueAttributes{

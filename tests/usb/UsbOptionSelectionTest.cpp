@@ -84,8 +84,7 @@ protected:
     std::int32_t status = -1;
 };
 
-// Product
-// --------------------------------------------------------------------------------------------------------
+// Product -----------------------------------------------------------------------------------------
 
 TEST_F(UsbAutoSelect, AsksThePostScriptInterpreterForItsProduct) {
     attach();
@@ -153,8 +152,7 @@ TEST_F(UsbAutoSelect, HasNoProductWhenTheInterpreterTellsNone) {
     }
 }
 
-// Which printer
-// --------------------------------------------------------------------------------------------------
+// Which printer -----------------------------------------------------------------------------------
 
 TEST_F(UsbAutoSelect, FindsThePrinterByItsLocation) {
     attach({.deviceID = "MFG:Example;MDL:PS 9000;CMD:POSTSCRIPT;"}, "2-1.3");
@@ -204,8 +202,7 @@ TEST_F(UsbAutoSelect, AsksNobodyForAUriWithoutADevice) {
     EXPECT_EQ(bench.node("1-4").driver(0), "usblp");
 }
 
-// Printers that are not to be asked
-// ------------------------------------------------------------------------------
+// Printers that are not to be asked ---------------------------------------------------------------
 
 TEST_F(UsbAutoSelect, SendsNothingToAPrinterThatSpeaksNoPostScript) {
     for (const auto* commandSet : {"CMD:PCL,PJL;", "", "CMD:;", "CMD:PSX;", "COMMAND SET:EPS;"}) {
@@ -247,8 +244,7 @@ TEST_F(UsbAutoSelect, TalksThroughTheBidirectionalSettingAndPutsTheFormerOneBack
     expectGivenBack();
 }
 
-// Options
-// --------------------------------------------------------------------------------------------------------
+// Options -----------------------------------------------------------------------------------------
 
 TEST_F(UsbAutoSelect, WritesWhatIsInstalledIntoANewPpd) {
     attach();
@@ -304,8 +300,7 @@ TEST_F(UsbAutoSelect, DeletesANewPpdThatNobodyTakes) {
         EXPECT_EQ(entry.path().filename(), "driver.ppd");
 }
 
-// Faults
-// ---------------------------------------------------------------------------------------------------------
+// Faults ------------------------------------------------------------------------------------------
 
 TEST_F(UsbAutoSelect, GivesUpOnASilentPrinter) {
     attach().interpreter = nullptr;
