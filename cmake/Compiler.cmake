@@ -19,7 +19,8 @@ add_compile_options(-Wno-deprecated-declarations)
 if(CMAKE_CXX_COMPILER_ID STREQUAL "GNU" AND CMAKE_CXX_COMPILER_VERSION VERSION_LESS 13)
   # Optimising, GCC 12 follows the paths of std::string, std::vector and std::variant wrongly, and warns of copies and
   # values that cannot be (its bugs 105651, 105562, 105329). Newer ones and clang keep these warnings.
-  add_compile_options(-Wno-restrict -Wno-maybe-uninitialized -Wno-array-bounds -Wno-stringop-overflow)
+  add_compile_options(-Wno-restrict -Wno-maybe-uninitialized -Wno-array-bounds -Wno-stringop-overflow
+                      -Wno-stringop-overread)
 endif()
 
 if(VENTRAS_SANITIZER)

@@ -4,6 +4,7 @@
 #include "ctl/DeviceIDCommand.h"
 #include "ctl/ExplainCommand.h"
 #include "ctl/PPDCommand.h"
+#include "ctl/PackageCommand.h"
 #include "ctl/PrinterCommand.h"
 #include "ctl/QueueCommand.h"
 #include "ctl/ScannersCommand.h"
@@ -26,6 +27,8 @@ constexpr Command kCommands[] = {
     {"service", "NAME", "what an IPP-over-USB printer says of itself in DNS-SD", showService},
     {"scanner", "STRING", "what a scanner's description says, and its PPD", showScanner},
     {"predicate", "ID...", "how driver packages for devices are asked for", showPredicate},
+    {"catalogue", "lookup ID|build DIR...", "the driver packages for a device; the catalogue of them",
+     showPackages, kPackageOptions},
     {"explain",
      "ARGUMENT...",
      "what the agent would do, if started so",

@@ -4,6 +4,7 @@
 #include <array>
 
 #include "ctl/Evidence.h"
+#include "ctl/PackageOffer.h"
 #include "ctl/Records.h"
 #include "ctl/Services.h"
 #include "ctl/SilentOutput.h"
@@ -86,6 +87,9 @@ Object explain(VentrasPrinterObject& device, Services& services) {
         const SilentOutput silent;
         return QueueMaker(services.platform(), services.drivers()).createQueueForDevice(device);
     }();
+    const bool wantsPackage = status == QueueStatus::kNoDriver;
+    const auto offer =
+        wantsPackage ? installedPackageOffer(device.softwareUpdateScanDeviceID()) : OfferedPackage{};
     const auto serving = status == QueueStatus::kAlreadyExists ? device.queueID() : std::nullopt;
     return {
         {"device", evidence.device},
@@ -98,6 +102,8 @@ Object explain(VentrasPrinterObject& device, Services& services) {
         {"status", status},
         {"outcome", serving == "" ? "nothing: it has no address by which to tell" : outcomeOf(status)},
         {"difficulty", device.difficulty()},
+        {"driverPackage", offer.package},
+        {"packageReason", wantsPackage ? Value(offer.reason) : Value()},
         {"createQueue", arrayOf(services.printSystem().takePlannedQueues())},
     };
 }

@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <cstdlib>
+#include <cstring>
 #include <memory>
 #include <type_traits>
 
@@ -34,7 +35,7 @@ std::size_t countOf(std::string_view wanted, std::string_view text) {
 }
 
 bool isReasonableXml(std::string_view text) {
-    return text.size() <= kLongestXml &&
+    return text.size() <= kLongestXml && text.find('\0') == std::string_view::npos &&
            countOf("<array", text) + countOf("<dict", text) <= kMostXmlContainers;
 }
 
@@ -117,10 +118,12 @@ std::optional<PropertyValue> read(plist_t node, int depth) {
             return static_cast<std::int64_t>(number);
         }
         case PLIST_STRING: {
-            char* text = nullptr;
-            plist_get_string_val(node, &text);
-            const PlistText owner{text};
-            return text == nullptr ? std::nullopt : std::optional<PropertyValue>{std::string(text)};
+            // Asked for a copy, libplist aborts the process when the text holds a NUL.
+            std::uint64_t length = 0;
+            const char* text = plist_get_string_ptr(node, &length);
+            if (text == nullptr || std::strlen(text) != length)
+                return std::nullopt;
+            return PropertyValue{std::string_view(text, length)};
         }
         case PLIST_ARRAY:
             return readArray(node, depth);

@@ -150,8 +150,8 @@ TEST(ExplainCommand, ListsTheSameForPeople) {
     const auto run = ctlAt(scheduler, {"explain", printer.uri()});
     EXPECT_EQ(run.exitStatus, 0) << run.standardError;
     for (const std::string line :
-         {"name         Acme Laser\n", "outcome      a queue would be made\n",
-          "(it is the driver for all driverless printers)\n", "createQueue  Acme_Laser (Acme Laser)\n"})
+         {"name           Acme Laser\n", "outcome        a queue would be made\n",
+          "(it is the driver for all driverless printers)\n", "createQueue    Acme_Laser (Acme Laser)\n"})
         EXPECT_NE(run.standardOutput.find(line), std::string::npos) << line << run.standardOutput;
 }
 

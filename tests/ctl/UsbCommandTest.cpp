@@ -63,6 +63,7 @@ TEST_F(CtlUsb, PlansTheQueueOfAPrinterAndMakesNone) {
               std::string::npos)
         << explained.standardOutput;
     EXPECT_EQ(json(explanation, "status"), "0");
+    EXPECT_EQ(json(explanation, "packageReason"), "null");
     EXPECT_TRUE(json(explanation, "createQueue").starts_with(R"([{"queueID":"HP_LaserJet",)"))
         << explained.standardOutput;
     EXPECT_TRUE(scheduler_.queues().empty());
@@ -76,6 +77,18 @@ TEST_F(CtlUsb, SaysThatNoDriverFits) {
     ASSERT_EQ(explanations.size(), 1U) << explained.standardOutput;
     EXPECT_EQ(json(explanations.front(), "driverList"), "[]");
     EXPECT_EQ(json(explanations.front(), "status"), "241");
+    EXPECT_EQ(json(explanations.front(), "driverPackage"), "null");
+    EXPECT_EQ(json(explanations.front(), "packageReason"), "\"no package in the catalogue is for it\"");
+}
+
+TEST_F(CtlUsb, SaysWhichPackageWouldBeOffered) {
+    bench_.plugIn("1-5", {.deviceID = "MFG:Brother;MDL:HL-L2300D series;CMD:PJL,HBP;"});
+    const auto explained = run({"explain", "--json", "-u22020096,0"});
+    const auto explanations = objectsIn(explained.standardOutput);
+    ASSERT_EQ(explanations.size(), 1U) << explained.standardOutput;
+    EXPECT_EQ(json(explanations.front(), "status"), "241") << explained.standardOutput;
+    EXPECT_EQ(json(explanations.front(), "driverPackage"), "\"printer-driver-brlaser\"");
+    EXPECT_TRUE(json(explanations.front(), "packageReason").starts_with("\"it is ")) << explained.standardOutput;
 }
 
 }  // namespace

@@ -172,6 +172,18 @@ TEST(PropertyList, ReadsALongListOfTexts) {
     EXPECT_EQ(parsePropertyList(*xml), PropertyValue{tags});
 }
 
+TEST(PropertyList, RefusesXmlWithANulAndLeavesOutBinaryTextsWithOne) {
+    EXPECT_FALSE(parsePropertyList(document("<string>a\0b</string>"s)));
+    EXPECT_FALSE(parsePropertyList(document("<dict><key>a\0b</key><true/></dict>"s)));
+    // A text of three characters in UTF-16.
+    const auto binary = [](char middle) {
+        return "bplist00\x63\0\x61\0"s + middle +
+               "\0\x62\x08\0\0\0\0\0\0\x01\x01\0\0\0\0\0\0\0\x01\0\0\0\0\0\0\0\0\0\0\0\0\0\0\0\x0f"s;
+    };
+    EXPECT_EQ(parsePropertyList(binary('-')), PropertyValue{"a-b"});
+    EXPECT_FALSE(parsePropertyList(binary('\0')));
+}
+
 TEST(PropertyList, RefusesWhatIsTooLong) {
     const auto xml = xmlPropertyList(std::string(std::size_t{4} * 1024 * 1024, 'x'));
     ASSERT_TRUE(xml);
