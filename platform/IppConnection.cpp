@@ -11,6 +11,7 @@
 
 #include "platform/ConnectFailure.h"
 #include "platform/HttpGuard.h"
+#include "platform/ResponseBody.h"
 
 namespace ventras {
 namespace {
@@ -26,11 +27,6 @@ const char* refusePassword(const char*, http_t*, const char*, const char*, void*
 
 std::string seconds(std::chrono::milliseconds time) {
     return std::to_string(std::chrono::ceil<std::chrono::seconds>(time).count()) + " s";
-}
-
-std::string lastErrorText() {
-    const char* text = cupsLastErrorString();
-    return text != nullptr ? text : "no reason given";
 }
 
 // A challenge is answered once, an upgrade to TLS is followed once; whoever then still wants something else,
@@ -57,8 +53,7 @@ constexpr std::array kHttpRefusals{
 };
 
 // Why there is no IPP answer: libcups' own texts are then left-overs of earlier system calls.
-IppAnswer unanswered(http_t* http) {
-    const auto status = httpGetStatus(http);
+IppAnswer unanswered(http_t* http, http_status_t status) {
     if (status == HTTP_STATUS_CUPS_AUTHORIZATION_CANCELED)
         return {nullptr, IPP_STATUS_ERROR_CUPS_AUTHENTICATION_CANCELED, "a password is asked for"};
     if (status >= HTTP_STATUS_MULTIPLE_CHOICES) {
@@ -92,26 +87,55 @@ http_status_t sendDocument(http_t* http, int document) {
     return status;
 }
 
-IppPtr attempt(http_t* http, ipp_t* request, const std::string& resource, int document) {
-    auto status = cupsSendRequest(http, request, resource.c_str(), requestLength(request, document));
-    if (status == HTTP_STATUS_CONTINUE && document >= 0)
-        status = sendDocument(http, document);
-    if (status > HTTP_STATUS_CONTINUE && status != HTTP_STATUS_OK)
-        return nullptr;
-    return IppPtr{cupsGetResponse(http, resource.c_str())};
-}
+// What came of one attempt at an exchange.
+struct Attempt {
+    IppPtr response;
+    http_status_t status;
+};
 
 bool asksAgain(http_status_t status) {
     return status == HTTP_STATUS_UNAUTHORIZED || status == HTTP_STATUS_UPGRADE_REQUIRED;
 }
 
-// Takes what follows the answer. False when it ended too early or could not be kept.
-bool receiveDocument(http_t* http, int received) {
-    std::array<char, kBlock> block;
-    for (ssize_t length = 0; (length = httpRead2(http, block.data(), block.size())) > 0;)
-        if (write(received, block.data(), static_cast<std::size_t>(length)) != length)
-            return false;
-    return httpGetState(http) == HTTP_STATE_WAITING;
+// Does what the peer wants before it carries the request out, so that a further attempt makes sense.
+http_status_t comply(http_t* http, http_status_t status, const std::string& resource) {
+    httpFlush(http);
+    if (status == HTTP_STATUS_UNAUTHORIZED && cupsDoAuthentication(http, "POST", resource.c_str()) != 0)
+        return HTTP_STATUS_CUPS_AUTHORIZATION_CANCELED;
+    if (asksAgain(status))
+        httpReconnect2(http, static_cast<int>(IppConnection::kConnectLimit.count()), nullptr);
+    if (status == HTTP_STATUS_UPGRADE_REQUIRED)
+        httpEncryption(http, HTTP_ENCRYPTION_REQUIRED);
+    return status;
+}
+
+http_status_t send(http_t* http, ipp_t* request, const std::string& resource, int document) {
+    const auto length = requestLength(request, document);
+    auto status = cupsSendRequest(http, request, resource.c_str(), length);
+    if (status == HTTP_STATUS_CONTINUE && document >= 0)
+        status = sendDocument(http, document);
+    if (status == HTTP_STATUS_CONTINUE && length == 0)
+        httpWrite2(http, "", 0);  // the last chunk
+    return status;
+}
+
+Attempt attempt(http_t* http, ipp_t* request, const std::string& resource, int document, ResponseBody& body) {
+    auto status = send(http, request, resource, document);
+    if (status > HTTP_STATUS_CONTINUE && status != HTTP_STATUS_OK)
+        return {nullptr, httpGetStatus(http)};
+    do
+        status = httpUpdate(http);
+    while (status == HTTP_STATUS_CONTINUE);
+    if (status == HTTP_STATUS_OK)
+        return {body.readMessage(), status};
+    return {nullptr, comply(http, status, resource)};
+}
+
+IppAnswer answered(IppPtr response) {
+    const auto status = ippGetStatusCode(response.get());
+    auto* attribute = ippFindAttribute(response.get(), "status-message", IPP_TAG_TEXT);
+    const char* message = attribute == nullptr ? nullptr : ippGetString(attribute, 0, nullptr);
+    return {std::move(response), status, message != nullptr ? message : ippErrorString(status)};
 }
 
 }  // namespace
@@ -168,16 +192,13 @@ IppAnswer IppConnection::exchangeBy(Deadline deadline, IppPtr request, const std
                                     int document, int received) {
     cupsSetPasswordCB2(refusePassword, nullptr);
     const HttpGuard guard(http_.get(), deadline);
-    IppPtr response;
-    for (int i = 0; i < kMostAttempts && !response; ++i) {
-        response = attempt(http_.get(), request.get(), resource, document);
-        if (!response && !asksAgain(httpGetStatus(http_.get())))
-            break;
-    }
+    ResponseBody body(http_.get());
+    Attempt last{nullptr, HTTP_STATUS_UNAUTHORIZED};
+    for (int i = 0; i < kMostAttempts && !last.response && asksAgain(last.status); ++i)
+        last = attempt(http_.get(), request.get(), resource, document, body);
 
-    IppAnswer answer =
-        response ? IppAnswer{std::move(response), cupsLastError(), lastErrorText()} : unanswered(http_.get());
-    if (answer.response && received >= 0 && !receiveDocument(http_.get(), received))
+    auto answer = last.response ? answered(std::move(last.response)) : unanswered(http_.get(), last.status);
+    if (answer.response && received >= 0 && !body.copyDocument(received))
         answer = {nullptr, IPP_STATUS_ERROR_INTERNAL, "the document that came back is incomplete"};
     if (httpGetState(http_.get()) != HTTP_STATE_WAITING)
         httpFlush(http_.get());

@@ -10,8 +10,15 @@ printer_runs() {
     kill -0 "$printer_pid" 2>/dev/null
 }
 
+# printer_listens PORT: whether it is our printer, and not somebody else's, that answers there.
+printer_listens() {
+    local socket
+    socket=$(awk -v port="$(printf ':%04X' "$1")" '$2 ~ port "$" && $4 == "0A" { print $10; exit }' /proc/net/tcp)
+    [[ -n $socket && -n $(find "/proc/$printer_pid/fd" -lname "socket:\\[$socket\\]" 2>/dev/null) ]]
+}
+
 printer_has_settled() {
-    port_is_open "$1" || ! printer_runs
+    printer_listens "$1" || ! printer_runs
 }
 
 # start_printer DIR: sets printer_uri. The first port is taken on which nobody answers and the printer can listen.
@@ -21,7 +28,7 @@ start_printer() {
     mkdir -p "$dir/tls" "$dir/pages"
     printf '#!/bin/sh\nexit 0\n' >"$dir/receive"
     chmod 755 "$dir/receive"
-    for ((port = 8631; port < 8640; port++)); do
+    for ((port = 8631; port < 8651; port++)); do
         port_is_open "$port" && continue
         # The preload stands in for the DNS-SD daemon, without which ippeveprinter does not start even unadvertised.
         LD_PRELOAD=$source_dir/build/release/tests/parts/libventras-no-avahi.so ippeveprinter -r off -n localhost \
@@ -29,11 +36,11 @@ start_printer() {
             -f application/pdf,image/urf -M Demonstration -m "Colour Printer" -l "this computer" "Demonstration Printer" \
             </dev/null >"$dir/printer.log" 2>&1 &
         printer_pid=$!
-        wait_until 100 printer_has_settled "$port" || break
-        if printer_runs; then
+        if wait_until 50 printer_has_settled "$port" && printer_listens "$port"; then
             printer_uri=ipp://localhost:$port/ipp/print
             return
         fi
+        stop_printer
     done
     die "the virtual printer does not start; see $dir/printer.log"
 }
