@@ -1,5 +1,4 @@
 #include <chrono>
-#include <csignal>
 #include <cstdint>
 #include <cstdio>
 #include <string>
@@ -32,7 +31,6 @@ int runAgent(ventras::Platform& platform, const std::vector<std::string>& argume
 
 int main(int argc, char* argv[]) {
     ventras::queueLock();
-    std::signal(SIGPIPE, SIG_IGN);  // a peer that closes a connection is an error to handle, not an end
     ventras::LinuxPlatform linuxPlatform;
     auto& platform = linuxPlatform.platform();
     if (const auto status = platform.authorization.create("system.print.admin"); status != 0)
