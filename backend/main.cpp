@@ -11,7 +11,7 @@
 
 #include "platform/Handles.h"
 #include "platform/IppConnection.h"
-#include "platform/linux/PrinterAddress.h"
+#include "platform/linux/options/PrinterAddress.h"
 
 namespace ventras {
 namespace {

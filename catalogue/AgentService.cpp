@@ -4,8 +4,8 @@
 
 #include "platform/Deadline.h"
 #include "platform/PrintToolAgentChannel.h"
-#include "platform/linux/GObjectPtr.h"
-#include "platform/linux/PropertyVariant.h"
+#include "platform/linux/desktop/GObjectPtr.h"
+#include "platform/linux/desktop/PropertyVariant.h"
 
 namespace ventras {
 namespace {

@@ -1,6 +1,6 @@
 #include "catalogue/ThisRelease.h"
 
-#include "platform/linux/GObjectPtr.h"
+#include "platform/linux/desktop/GObjectPtr.h"
 
 namespace ventras {
 

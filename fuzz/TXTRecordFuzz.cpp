@@ -6,7 +6,7 @@
 
 #include "devices/TXTRecord.h"
 #include "platform/Utf8.h"
-#include "platform/linux/LocalServiceResolver.h"
+#include "platform/linux/options/LocalServiceResolver.h"
 
 // A DNS-SD record is whatever somebody registered. It is read as a dictionary, key by key, and as an SRV
 // record.

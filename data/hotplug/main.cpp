@@ -11,7 +11,7 @@
 #include <string>
 #include <vector>
 
-#include "platform/linux/LibusbDevice.h"
+#include "platform/linux/usb/LibusbDevice.h"
 
 namespace {
 

@@ -2,18 +2,18 @@
 
 #include "platform/Platform.h"
 #include "platform/RunLoop.h"
-#include "platform/linux/CupsPrintSystem.h"
-#include "platform/linux/DBusNotificationBroadcast.h"
-#include "platform/linux/DBusPrintToolAgentChannel.h"
 #include "platform/linux/DataFolder.h"
 #include "platform/linux/GettextStringTable.h"
-#include "platform/linux/LibusbRegistry.h"
-#include "platform/linux/LinuxComputerName.h"
 #include "platform/linux/PlistPreferenceStore.h"
-#include "platform/linux/PolkitAuthorization.h"
 #include "platform/linux/ProcProcessTable.h"
 #include "platform/linux/Syslog.h"
-#include "platform/linux/UnavailableInstallController.h"
+#include "platform/linux/desktop/DBusNotificationBroadcast.h"
+#include "platform/linux/desktop/DBusPrintToolAgentChannel.h"
+#include "platform/linux/desktop/LinuxComputerName.h"
+#include "platform/linux/desktop/PolkitAuthorization.h"
+#include "platform/linux/desktop/UnavailableInstallController.h"
+#include "platform/linux/scheduler/CupsPrintSystem.h"
+#include "platform/linux/usb/LibusbRegistry.h"
 
 namespace ventras {
 

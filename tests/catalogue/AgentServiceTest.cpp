@@ -2,7 +2,7 @@
 
 #include <thread>
 
-#include "platform/linux/DBusPrintToolAgentChannel.h"
+#include "platform/linux/desktop/DBusPrintToolAgentChannel.h"
 #include "tests/catalogue/CatalogueTexts.h"
 #include "tests/fakes/PropertyValuePrinter.h"
 #include "tests/platform-linux/PrivateBus.h"

@@ -7,7 +7,7 @@
 
 #include "devices/TXTQuery.h"
 #include "platform/ServiceRecord.h"
-#include "platform/linux/LocalServiceResolver.h"
+#include "platform/linux/options/LocalServiceResolver.h"
 #include "tests/responder/PrivateResponder.h"
 
 namespace ventras {

@@ -1,4 +1,4 @@
-#include "platform/linux/PolkitAuthorization.h"
+#include "platform/linux/desktop/PolkitAuthorization.h"
 
 // Its exit status is the answer for the right that its one argument names.
 int main(int count, char** arguments) {

@@ -3,7 +3,7 @@
 #include <functional>
 #include <thread>
 
-#include "platform/linux/GObjectPtr.h"
+#include "platform/linux/desktop/GObjectPtr.h"
 
 namespace ventras {
 

@@ -1,4 +1,4 @@
-#include "platform/linux/CupsPrintSystem.h"
+#include "platform/linux/scheduler/CupsPrintSystem.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>

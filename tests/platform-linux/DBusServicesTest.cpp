@@ -6,11 +6,11 @@
 #include <condition_variable>
 #include <mutex>
 
-#include "platform/linux/DBusCall.h"
-#include "platform/linux/DBusNotificationBroadcast.h"
-#include "platform/linux/DBusPrintToolAgentChannel.h"
-#include "platform/linux/LinuxComputerName.h"
-#include "platform/linux/PropertyVariant.h"
+#include "platform/linux/desktop/DBusCall.h"
+#include "platform/linux/desktop/DBusNotificationBroadcast.h"
+#include "platform/linux/desktop/DBusPrintToolAgentChannel.h"
+#include "platform/linux/desktop/LinuxComputerName.h"
+#include "platform/linux/desktop/PropertyVariant.h"
 #include "tests/fakes/FakePlatform.h"
 #include "tests/platform-linux/FakeBusService.h"
 #include "tests/platform-linux/PrivateBus.h"

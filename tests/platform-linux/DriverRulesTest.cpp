@@ -1,10 +1,10 @@
-#include "platform/linux/DriverRules.h"
+#include "platform/linux/ppd/DriverRules.h"
 
 #include <fcntl.h>
 #include <gtest/gtest.h>
 #include <sys/stat.h>
 
-#include "platform/linux/PpdFile.h"
+#include "platform/linux/ppd/PpdFile.h"
 #include "tests/parts/TemporaryFolder.h"
 #include "tests/platform-linux/PpdTexts.h"
 

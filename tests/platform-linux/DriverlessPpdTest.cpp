@@ -1,12 +1,12 @@
-#include "platform/linux/DriverlessPpd.h"
+#include "platform/linux/options/DriverlessPpd.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
 #include <random>
 
-#include "platform/linux/DriverRules.h"
-#include "platform/linux/PpdFile.h"
+#include "platform/linux/ppd/DriverRules.h"
+#include "platform/linux/ppd/PpdFile.h"
 #include "tests/parts/ScriptedPrinter.h"
 #include "tests/parts/TemporaryFolder.h"
 #include "tests/platform-linux/PrinterDescription.h"

@@ -1,4 +1,4 @@
-#include "platform/linux/IppOptionSelection.h"
+#include "platform/linux/options/IppOptionSelection.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -7,9 +7,9 @@
 #include <set>
 #include <thread>
 
-#include "platform/linux/AutoSelect.h"
-#include "platform/linux/DriverRules.h"
-#include "platform/linux/PpdFile.h"
+#include "platform/linux/options/AutoSelect.h"
+#include "platform/linux/ppd/DriverRules.h"
+#include "platform/linux/ppd/PpdFile.h"
 #include "tests/fakes/FakePlatform.h"
 #include "tests/parts/BlackHole.h"
 #include "tests/parts/PrivateScheduler.h"

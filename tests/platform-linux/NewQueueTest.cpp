@@ -1,4 +1,4 @@
-#include "platform/linux/NewQueue.h"
+#include "platform/linux/scheduler/NewQueue.h"
 
 #include <gtest/gtest.h>
 

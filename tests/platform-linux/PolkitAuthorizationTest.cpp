@@ -7,7 +7,7 @@
 #include <chrono>
 #include <mutex>
 
-#include "platform/linux/PolkitAuthorization.h"
+#include "platform/linux/desktop/PolkitAuthorization.h"
 #include "tests/parts/PrivateScheduler.h"
 #include "tests/parts/Program.h"
 #include "tests/platform-linux/FakeBusService.h"

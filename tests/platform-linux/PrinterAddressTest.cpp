@@ -1,8 +1,8 @@
-#include "platform/linux/PrinterAddress.h"
+#include "platform/linux/options/PrinterAddress.h"
 
 #include <gtest/gtest.h>
 
-#include "platform/linux/LocalServiceResolver.h"
+#include "platform/linux/options/LocalServiceResolver.h"
 
 namespace ventras {
 namespace {

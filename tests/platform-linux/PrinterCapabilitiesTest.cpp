@@ -1,9 +1,9 @@
-#include "platform/linux/PrinterCapabilities.h"
+#include "platform/linux/options/PrinterCapabilities.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include "platform/linux/CapabilityText.h"
+#include "platform/linux/options/CapabilityText.h"
 #include "tests/parts/ScriptedPrinter.h"
 #include "tests/platform-linux/PrinterDescription.h"
 

@@ -4,7 +4,7 @@
 #include <vector>
 
 #include "platform/Handles.h"
-#include "platform/linux/PrinterCapabilities.h"
+#include "platform/linux/options/PrinterCapabilities.h"
 
 namespace ventras {
 

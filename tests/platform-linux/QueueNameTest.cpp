@@ -1,4 +1,4 @@
-#include "platform/linux/QueueName.h"
+#include "platform/linux/scheduler/QueueName.h"
 
 #include <gtest/gtest.h>
 

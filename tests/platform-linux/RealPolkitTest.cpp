@@ -6,7 +6,7 @@
 #include <stdexcept>
 #include <thread>
 
-#include "platform/linux/DBusCall.h"
+#include "platform/linux/desktop/DBusCall.h"
 #include "tests/parts/PrivateScheduler.h"
 #include "tests/parts/Program.h"
 #include "tests/parts/TemporaryFolder.h"

@@ -13,7 +13,7 @@
 #include "platform/linux/PlistPreferenceStore.h"
 #include "platform/linux/ProcProcessTable.h"
 #include "platform/linux/Syslog.h"
-#include "platform/linux/UnavailableInstallController.h"
+#include "platform/linux/desktop/UnavailableInstallController.h"
 #include "tests/fakes/FakePlatform.h"
 #include "tests/parts/Program.h"
 #include "tests/parts/TemporaryFolder.h"

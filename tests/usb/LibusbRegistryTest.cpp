@@ -1,4 +1,4 @@
-#include "platform/linux/LibusbRegistry.h"
+#include "platform/linux/usb/LibusbRegistry.h"
 
 #include <gmock/gmock.h>
 #include <sys/stat.h>

@@ -1,4 +1,4 @@
-#include "platform/linux/PostScriptReply.h"
+#include "platform/linux/options/PostScriptReply.h"
 
 #include <gmock/gmock.h>
 

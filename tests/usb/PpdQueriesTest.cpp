@@ -1,4 +1,4 @@
-#include "platform/linux/PpdQueries.h"
+#include "platform/linux/options/PpdQueries.h"
 
 #include <gmock/gmock.h>
 

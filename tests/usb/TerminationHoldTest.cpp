@@ -1,4 +1,4 @@
-#include "platform/linux/TerminationHold.h"
+#include "platform/linux/usb/TerminationHold.h"
 
 #include <gtest/gtest.h>
 #include <unistd.h>

@@ -2,7 +2,7 @@
 
 #include <string_view>
 
-#include "platform/linux/UsbOptionSelection.h"
+#include "platform/linux/options/UsbOptionSelection.h"
 #include "tests/fakes/FakePlatform.h"
 #include "tests/parts/UsbBench.h"
 

@@ -1,4 +1,4 @@
-#include "platform/linux/UsbOptionSelection.h"
+#include "platform/linux/options/UsbOptionSelection.h"
 
 #include <gmock/gmock.h>
 #include <sys/wait.h>

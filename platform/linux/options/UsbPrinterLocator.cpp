@@ -1,0 +1,182 @@
+#include "platform/linux/options/UsbPrinterLocator.h"
+
+#include <cups/http.h>
+
+#include <algorithm>
+#include <array>
+#include <charconv>
+#include <span>
+#include <string_view>
+#include <vector>
+
+namespace ventras {
+namespace {
+
+using namespace std::string_view_literals;
+
+constexpr unsigned kWait = 5000;  // milliseconds
+constexpr std::uint8_t kBidirectional = 2;
+
+constexpr std::array kSerialNumberKeys{"SN"sv, "SRN"sv, "SERN"sv};
+constexpr std::array kCommandSetKeys{"CMD"sv, "COMMAND SET"sv};
+
+/// What a URI says of its printer.
+struct Wanted {
+    std::string model;
+    std::string serialNumber;
+    std::optional<std::uint32_t> location;
+};
+
+std::string withoutPlus(std::string text) {
+    std::erase(text, '+');
+    return text;
+}
+
+std::optional<Wanted> wantedBy(const std::string& deviceURI) {
+    std::array<char, 32> scheme{};
+    std::array<char, 1024> user{}, host{}, resource{};
+    int port = 0;
+    const auto status =
+        httpSeparateURI(HTTP_URI_CODING_ALL, deviceURI.c_str(), scheme.data(), scheme.size(), user.data(),
+                        user.size(), host.data(), host.size(), &port, resource.data(), resource.size());
+    if (status < HTTP_URI_STATUS_OK || scheme.data() != "usb"sv)
+        return std::nullopt;
+    const std::string_view path = resource.data();
+    Wanted wanted;
+    const auto question = path.rfind('?');
+    const auto query = question == path.npos ? std::string_view{} : path.substr(question + 1);
+    wanted.model =
+        path.substr(std::min<std::size_t>(1, path.size()), question == path.npos ? question : question - 1);
+    if (query.starts_with("serial="))
+        wanted.serialNumber = withoutPlus(std::string(query.substr(7)));
+    if (query.starts_with("location=")) {
+        std::uint32_t location = 0;
+        const auto digits = query.substr(9);
+        const auto end = std::from_chars(digits.data(), digits.data() + digits.size(), location, 16).ptr;
+        if (!digits.empty() && end == digits.data() + digits.size())
+            wanted.location = location;
+    }
+    return wanted.location || !wanted.serialNumber.empty() ? std::optional{wanted} : std::nullopt;
+}
+
+const LibusbSetting* bidirectionalSetting(const LibusbInterface& interface) {
+    for (const auto& setting : interface.settings)
+        if (setting.matches(kUsbPrinterInterfaces) &&
+            setting.descriptor.bInterfaceProtocol == kBidirectional && setting.bulkIn && setting.bulkOut)
+            return &setting;
+    return nullptr;
+}
+
+/// The IEEE 1284 device ID; empty when the printer does not tell it.
+std::string deviceIDOf(libusb_device_handle* handle, const LibusbDevice& device, std::uint8_t interface,
+                       std::uint8_t alternate) {
+    std::array<std::uint8_t, 1024> reply{};
+    const int received = libusb_control_transfer(
+        handle, 0xA1, 0, static_cast<std::uint16_t>(device.configuration - 1),
+        static_cast<std::uint16_t>(interface << 8U | alternate), reply.data(), reply.size(), kWait);
+    if (received < 2)
+        return {};
+    const std::size_t length = static_cast<std::size_t>(reply[0]) << 8U | reply[1];
+    const auto text =
+        std::span(reply).first(std::clamp<std::size_t>(length, 2, static_cast<std::size_t>(received)));
+    return {text.begin() + 2, text.end()};
+}
+
+/// The value of the first component of a device ID that has one of the keys.
+std::string valueOf(std::string_view deviceID, std::span<const std::string_view> keys) {
+    while (!deviceID.empty()) {
+        const auto component = deviceID.substr(0, deviceID.find(';'));
+        const auto colon = component.find(':');
+        const auto isKey = [&](std::string_view key) {
+            return std::ranges::equal(component.substr(0, colon), key, {}, [](char c) {
+                return c >= 'a' && c <= 'z' ? static_cast<char>(c - 'a' + 'A') : c;
+            });
+        };
+        if (colon != component.npos && std::ranges::any_of(keys, isKey))
+            return std::string(component.substr(colon + 1));
+        deviceID.remove_prefix(std::min(component.size() + 1, deviceID.size()));
+    }
+    return {};
+}
+
+/// The serial number of the device's own descriptors, cut down to 8-bit characters as in queues' URIs.
+std::string descriptorSerialNumber(libusb_device_handle* handle, libusb_device* device) {
+    libusb_device_descriptor descriptor{};
+    std::array<std::uint8_t, 255> reply{};
+    if (libusb_get_device_descriptor(device, &descriptor) != 0 || descriptor.iSerialNumber == 0)
+        return {};
+    const int received =
+        libusb_control_transfer(handle, LIBUSB_ENDPOINT_IN, LIBUSB_REQUEST_GET_DESCRIPTOR,
+                                static_cast<std::uint16_t>(LIBUSB_DT_STRING << 8 | descriptor.iSerialNumber),
+                                0x0409, reply.data(), reply.size(), kWait);
+    std::string text;
+    for (std::size_t at = 2; received > 0 && at + 1 < static_cast<std::size_t>(received); at += 2)
+        text += static_cast<char>(reply.at(at));
+    return text;
+}
+
+/// A printer with what it says of itself.
+struct Candidate {
+    UsbPrinterPlace place;
+    std::string deviceID;
+};
+
+using Verdict = std::variant<Candidate, std::string>;
+
+Verdict examine(const LibusbDevicePtr& device, const LibusbInterface& interface, const Wanted& wanted) {
+    const auto* setting = bidirectionalSetting(interface);
+    if (setting == nullptr)
+        return "it talks in one direction only";
+    int error = 0;
+    const auto handle = device->open(error);
+    if (!handle)
+        return std::string("it cannot be opened: ") + libusb_strerror(error);
+    const auto id =
+        deviceIDOf(handle.get(), *device, interface.number, setting->descriptor.bAlternateSetting);
+    if (!wanted.location) {
+        auto serial = valueOf(id, kSerialNumberKeys);
+        if (serial.empty())
+            serial = descriptorSerialNumber(handle.get(), device->device.get());
+        if (withoutPlus(serial) != wanted.serialNumber)
+            return "no printer has that serial number";
+    }
+    return Candidate{{device, interface.number, *setting, valueOf(id, kCommandSetKeys)}, id};
+}
+
+}  // namespace
+
+std::variant<UsbPrinterPlace, std::string> findUsbPrinter(LibusbContext& context,
+                                                          const std::string& deviceURI) {
+    const auto wanted = wantedBy(deviceURI);
+    if (!wanted)
+        return "its URI names no device of the USB";
+    const auto devices = context.devices();
+    if (!devices)
+        return "the USB cannot be listed";
+
+    std::vector<Candidate> candidates;
+    std::string reason = "it is not attached";
+    for (const auto& device : *devices)
+        for (const auto& interface : device->interfaces) {
+            if (!interface.hasSetting(kUsbPrinterInterfaces) ||
+                (wanted->location && device->location != *wanted->location))
+                continue;
+            auto verdict = examine(device, interface, *wanted);
+            if (auto* candidate = std::get_if<Candidate>(&verdict))
+                candidates.push_back(std::move(*candidate));
+            else
+                reason = std::get<std::string>(verdict);
+        }
+    // Makers have given one serial number to many devices; then the model decides, if it can.
+    if (candidates.size() > 1)
+        std::erase_if(candidates, [&](const auto& each) {
+            return each.deviceID.find(wanted->model) == std::string::npos;
+        });
+    if (candidates.size() > 1)
+        return "several printers go by that URI";
+    if (candidates.empty())
+        return reason;
+    return std::move(candidates.front().place);
+}
+
+}  // namespace ventras
