@@ -178,9 +178,8 @@ UsbAnswer FakePrinter::answer(const UsbSetup& setup) {
 UsbAnswer FakePrinter::control(const UsbSetup& setup) {
     const std::lock_guard lock(mutex_);
     requests_.push_back(setup);
-    if (fault)
-        if (auto faulty = fault(setup))
-            return std::move(*faulty);
+    if (auto faulty = fault(setup))
+        return std::move(*faulty);
     auto reply = answer(setup);
     if (reply.data.size() > setup.wLength)
         reply.data.resize(setup.wLength);
@@ -189,25 +188,22 @@ UsbAnswer FakePrinter::control(const UsbSetup& setup) {
 
 UsbAnswer FakePrinter::bulkOut(std::uint8_t endpoint, std::string_view data) {
     const std::lock_guard lock(mutex_);
-    if (bulkFault)
-        if (auto faulty = bulkFault(endpoint))
-            return std::move(*faulty);
+    if (auto faulty = bulkFault(endpoint))
+        return std::move(*faulty);
     if (endpoint != kBulkOut)
         return UsbAnswer::stall();
     received_ += data;
-    if (interpreter)
-        toSend_ += interpreter(data);
+    toSend_ += interpreter(data);
     return {};
 }
 
 std::optional<UsbAnswer> FakePrinter::bulkIn(std::uint8_t endpoint, std::size_t most) {
     const std::lock_guard lock(mutex_);
-    if (bulkFault)
-        if (auto faulty = bulkFault(endpoint))
-            return faulty;
+    if (auto faulty = bulkFault(endpoint))
+        return faulty;
     if (endpoint != kBulkIn)
         return UsbAnswer::stall();
-    if (toSend_.empty() && interpreter)
+    if (toSend_.empty())
         toSend_ += interpreter({});
     if (toSend_.empty())
         return std::nullopt;

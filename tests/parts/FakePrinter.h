@@ -3,13 +3,14 @@
 #include <chrono>
 #include <cstddef>
 #include <cstdint>
-#include <functional>
 #include <map>
 #include <mutex>
 #include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
+
+#include "Hook.h"
 
 namespace ventras {
 
@@ -69,14 +70,14 @@ class FakePrinter {
 public:
     explicit FakePrinter(FakePrinterModel model = {}) : model_(std::move(model)) {}
 
-    /// Looks at every control request first; what it returns is the answer. Set it before the device is used.
-    std::function<std::optional<UsbAnswer>(const UsbSetup&)> fault;
+    /// Looks at every control request first; what it returns is the answer.
+    Hook<std::optional<UsbAnswer>(const UsbSetup&)> fault;
 
     /// The same for bulk transfers; its argument is the endpoint address.
-    std::function<std::optional<UsbAnswer>(std::uint8_t)> bulkFault;
+    Hook<std::optional<UsbAnswer>(std::uint8_t)> bulkFault;
 
     /// Takes what arrives at the bulk endpoint and gives what the device says to it.
-    std::function<std::string(std::string_view)> interpreter;
+    Hook<std::string(std::string_view)> interpreter;
 
     const FakePrinterModel& model() const { return model_; }
 

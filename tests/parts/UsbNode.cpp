@@ -82,6 +82,8 @@ struct UsbNode::Transfer {
 };
 
 UsbNode::UsbNode(FakePrinter& printer) : printer_(printer), handler_(umockdev_ioctl_base_new()) {
+    // umockdev's thread takes this lock first and so finds everything that was made before it.
+    const std::lock_guard lock(mutex_);
     g_signal_connect(handler_, "handle-ioctl", G_CALLBACK(handleIoctl), this);
     g_signal_connect(handler_, "client-connected", G_CALLBACK(clientConnected), this);
 }
