@@ -150,7 +150,7 @@ UsbAnswer FakePrinter::answer(const UsbSetup& setup) {
         case 0x8008:  // GET_CONFIGURATION
             return {0, {model_.configuration}, {}};
         case 0x810A:  // GET_INTERFACE
-            return {0, {currentSetting(interface)}, {}};
+            return {0, {settingInUse(interface)}, {}};
         case 0x0009:  // SET_CONFIGURATION
             currentSettings_.clear();
             return {};
@@ -213,6 +213,11 @@ std::optional<UsbAnswer> FakePrinter::bulkIn(std::uint8_t endpoint, std::size_t 
 }
 
 std::uint8_t FakePrinter::currentSetting(std::uint8_t interface) const {
+    const std::lock_guard lock(mutex_);
+    return settingInUse(interface);
+}
+
+std::uint8_t FakePrinter::settingInUse(std::uint8_t interface) const {
     const auto current = currentSettings_.find(interface);
     return current == currentSettings_.end() ? std::uint8_t{0} : current->second;
 }

@@ -100,6 +100,7 @@ private:
     UsbAnswer answer(const UsbSetup& setup);
     UsbAnswer descriptor(const UsbSetup& setup) const;
     UsbBytes stringDescriptor(std::uint8_t index) const;
+    std::uint8_t settingInUse(std::uint8_t interface) const;
 
     FakePrinterModel model_;
     mutable std::mutex mutex_;

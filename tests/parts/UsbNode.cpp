@@ -89,6 +89,7 @@ UsbNode::UsbNode(FakePrinter& printer) : printer_(printer), handler_(umockdev_io
 }
 
 UsbNode::~UsbNode() {
+    const std::lock_guard lock(mutex_);
     g_signal_handlers_disconnect_by_data(handler_, this);
     for (auto* client : clients_)
         g_object_weak_unref(G_OBJECT(client), clientGone, this);

@@ -261,7 +261,7 @@ TEST(IppOptionSelection, GivesUpOnASilentPrinterInTime) {
     };
     std::vector<std::jthread> threads;
     for (const auto& [scheme, fault] : kCases)
-        threads.emplace_back([scheme, fault] {
+        threads.emplace_back([scheme = scheme, fault = fault] {
             const ScriptedPrinter printer({.fault = fault});
             const auto start = std::chrono::steady_clock::now();
             const auto selection = select(printer.uri(scheme));

@@ -228,10 +228,8 @@ const FaultCase kFaults[] = {
 
 TEST_F(Libusb, TellsHowARequestEnded) {
     auto& printer = bench.plugIn("1-1");
-    const FaultCase* present = nullptr;
-    printer.fault = [&](const UsbSetup&) { return std::optional{present->answer}; };
     for (const auto& fault : kFaults) {
-        present = &fault;
+        printer.fault = [answer = fault.answer](const UsbSetup&) { return std::optional{answer}; };
         const auto interface = openFirst();
         auto request = getDeviceID();
         EXPECT_EQ(registry.controlRequest(*interface, request), fault.status) << fault.name;
@@ -265,7 +263,7 @@ TEST_F(Libusb, AsksForWhatUsbfsCanMoveOfALongerID) {
 
 TEST_F(Libusb, ReadsAnIDWithSwappedLengthBytes) {
     const std::string id = "MFG:Example;MDL:Laser 9000;CMD:PCL,PJL;SN:A1;";
-    bench.plugIn("1-1").fault = [&](const UsbSetup& setup) {
+    bench.plugIn("1-1").fault = [id](const UsbSetup& setup) {
         return isGetDeviceID(setup)
                    ? std::optional{UsbAnswer::deviceID(static_cast<std::uint16_t>((id.size() + 2) << 8U), id)}
                    : std::nullopt;
@@ -285,9 +283,8 @@ TEST_F(Libusb, FindsNoDeviceOnceItIsGone) {
 }
 
 TEST_F(Libusb, SurvivesADeviceThatGoesBetweenTwoRequests) {
-    int count = 0;
     bench.plugIn("1-1", {.deviceID = "CMD:PCL;", .manufacturer = "M", .productName = "P"}).fault =
-        [&](const UsbSetup&) {
+        [count = 0](const UsbSetup&) mutable {
             return ++count > 2 ? std::optional{UsbAnswer{ESHUTDOWN, {}, {}}} : std::nullopt;
         };
     EXPECT_THAT(firstDeviceID(), Optional("CMD:PCL;"s));

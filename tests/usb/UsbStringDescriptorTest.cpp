@@ -129,7 +129,7 @@ const OddString kOddStrings[] = {
 TEST_F(UsbStringDescriptor, IsReadAsFarAsItGoes) {
     for (const auto& [reply, expected] : kOddStrings) {
         registry = FakeUsbRegistry();
-        attachAnswering([&](const UsbSetup& setup) {
+        attachAnswering([&reply = reply](const UsbSetup& setup) {
             UsbAnswer answer{0, reply, {}};
             answer.data.resize(std::min<std::size_t>(reply.size(), setup.wLength));
             return answer;
