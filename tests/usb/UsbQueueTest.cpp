@@ -11,6 +11,7 @@
 #include "tests/agent/Agent.h"
 #include "tests/parts/PostScriptInterpreter.h"
 #include "tests/parts/PrivateScheduler.h"
+#include "tests/parts/StockUsbBackend.h"
 #include "tests/parts/UsbBench.h"
 #include "tests/usb/PostScriptPpd.h"
 
@@ -30,6 +31,8 @@ constexpr const char* kBrother = "MFG:Brother;CMD:PJL,HBP;MDL:DCP-7030;CLS:PRINT
 constexpr const char* kPrologue =
     "/statusdict 10 dict def statusdict /product (Example PS 9000) put /duplexerInstalled true def /trays 2 "
     "def";
+
+constexpr const char* kEndOfPclPage = "\x1b*r0B";
 
 FakePrinterModel printerSaying(std::string deviceID) {
     FakePrinterModel model;
@@ -51,19 +54,29 @@ protected:
         std::ofstream(data / "model/Library/Printers/exps9000.ppd") << postScriptPpd();
     }
 
-    /// Replaces the backend that lays jobs down by the system's own, which sees the bench. Nobody but root
-    /// may run the original; a backend that is closed to others is run as root.
+    /// Replaces the backend that lays jobs down by the system's own, which sees the bench, with the agent's
+    /// in front of it. Nobody but root may run the original; a backend that is closed to others is run as
+    /// root.
     void useStockBackend() const {
         const auto backend = scheduler.folder() / "bin/backend/usb";
-        const auto stock = scheduler.folder() / "bin/stock-usb";
-        fs::copy_file("/usr/lib/cups/backend/usb", stock);
-        fs::permissions(stock, fs::perms{0700});
+        const auto programs = scheduler.folder() / "stock";
+        copyStockUsbBackend(programs / "daemon/stock-usb");
         std::ofstream script(backend);
         script << "#!/bin/sh\n";
         for (const auto& [name, value] : bench.environment())
             script << "export " << name << "='" << value << "'\n";
-        script << "exec " << stock << " \"$@\"\n";
+        script << "export CUPS_SERVERBIN=" << programs << "\nexec " << VENTRAS_USB_BACKEND << " \"$@\"\n";
         fs::permissions(backend, fs::perms{0700});
+    }
+
+    static bool receives(const FakePrinter& printer, std::string_view text) {
+        const auto deadline = std::chrono::steady_clock::now() + 30s;
+        while (printer.received().find(text) == std::string::npos) {
+            if (std::chrono::steady_clock::now() > deadline)
+                return false;
+            std::this_thread::sleep_for(20ms);
+        }
+        return true;
     }
 
     static Environment together(Environment one, const Environment& other) {
@@ -150,13 +163,54 @@ TEST_F(UsbQueue, PrintsThroughTheStockBackendToThePrinter) {
     ASSERT_EQ(run.exitStatus, 0) << run.story();
     useStockBackend();
     scheduler.print(run.queueID(), "hello.pdf");
-    const auto endOfJob = "@PJL EOJ"s;
-    const auto deadline = std::chrono::steady_clock::now() + 30s;
-    while (printer.received().find(endOfJob) == std::string::npos &&
-           std::chrono::steady_clock::now() < deadline)
-        std::this_thread::sleep_for(20ms);
-    EXPECT_THAT(printer.received(), AllOf(HasSubstr("@PJL ENTER LANGUAGE = PCL"), HasSubstr(endOfJob)))
-        << scheduler.errorLog();
+    EXPECT_TRUE(receives(printer, "@PJL EOJ")) << scheduler.errorLog();
+    EXPECT_THAT(printer.received(), HasSubstr("@PJL ENTER LANGUAGE = PCL"));
+}
+
+struct StockCase {
+    const char *deviceID, *serialNumber, *queueURI;
+};
+// Devices that the stock backend lists under other URIs than those of their queues.
+const StockCase kStock[] = {
+    {"MFG:HP;MDL:HP LaserJet;CMD:PCL;SN:C4;", "C4", "usb://HP/HP%20LaserJet?serial=C4"},
+    {"MFG:HP;MDL:HP LaserJet;CMD:PCL;", "", "usb://HP/HP%20LaserJet?location=1400000"},
+    {"MFG:Hewlett-Packard;MDL:HP LaserJet;CMD:PCL;", "S1", "usb://Hewlett-Packard/HP%20LaserJet?serial=S1"},
+    {"MFG:HP;MDL:LaserJet;CMD:PCL;", "", "usb://HP/LaserJet?location=1400000"},
+    {"MFG:HP;MDL:HP LaserJet;CMD:PCL;SN:E6;", "4536", "usb://HP/HP%20LaserJet?serial=E6"},
+};
+
+TEST_F(UsbQueue, PrintsThoughTheStockBackendKnowsThePrinterByAnotherURI) {
+    useStockBackend();
+    for (const auto& [deviceID, serialNumber, queueURI] : kStock) {
+        auto model = printerSaying(deviceID);
+        model.serialNumber = serialNumber;
+        auto& printer = attach(model);
+        const auto run = agent.run({kLocation});
+        ASSERT_EQ(run.exitStatus, 0) << run.story();
+        EXPECT_EQ(scheduler.attribute(run.queueID(), "device-uri"), queueURI);
+        scheduler.print(run.queueID(), "hello.pdf");
+        EXPECT_TRUE(receives(printer, kEndOfPclPage)) << queueURI << '\n' << scheduler.errorLog();
+        bench.unplug("1-4");
+    }
+}
+
+TEST_F(UsbQueue, PrintsToTheRightOneOfTwoPrintersOnceItIsThere) {
+    useStockBackend();
+    auto model = printerSaying("MFG:HP;MDL:HP LaserJet;CMD:PCL;SN:C4;");
+    model.serialNumber = "4334";
+    attach(model);
+    const auto run = agent.run({kLocation});
+    ASSERT_EQ(run.exitStatus, 0) << run.story();
+    bench.unplug("1-4");
+    auto other = printerSaying("MFG:HP;MDL:HP LaserJet;CMD:PCL;SN:D5;");
+    other.serialNumber = "4435";
+    auto& wrong = attach(other, "1-5");
+    scheduler.print(run.queueID(), "hello.pdf");
+    std::this_thread::sleep_for(3s);
+    EXPECT_THAT(wrong.received(), IsEmpty());
+    auto& right = attach(model, "2-1");
+    EXPECT_TRUE(receives(right, kEndOfPclPage)) << scheduler.errorLog();
+    EXPECT_THAT(wrong.received(), IsEmpty());
 }
 
 TEST_F(UsbQueue, IsNotMadeForAPrinterThatSpeaksIppOverUsb) {

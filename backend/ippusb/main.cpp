@@ -1,14 +1,13 @@
 #include <cups/backend.h>
-#include <unistd.h>
 
 #include <chrono>
 #include <cstdio>
-#include <cstdlib>
 #include <optional>
 #include <string>
 #include <string_view>
 #include <thread>
 
+#include "backend/StockBackend.h"
 #include "platform/Handles.h"
 #include "platform/IppConnection.h"
 #include "platform/linux/options/PrinterAddress.h"
@@ -28,14 +27,9 @@ void say(const char* line) {
     std::fputs(line, stderr);
 }
 
-std::optional<std::string> environment(const char* name) {
-    const char* value = std::getenv(name);
-    return value == nullptr ? std::nullopt : std::optional<std::string>(value);
-}
-
 // Queues for sending faxes say so in their PPD.
 PrinterService serviceOfQueue() {
-    const auto file = environment("PPD");
+    const auto file = schedulerVariable("PPD");
     const PpdPtr ppd{file ? ppdOpenFile(file->c_str()) : nullptr};
     const auto* fax = ppd ? ppdFindAttr(ppd.get(), "cupsFax", nullptr) : nullptr;
     const bool isFax = fax != nullptr && fax->value != nullptr && strcasecmp(fax->value, "True") == 0;
@@ -57,7 +51,7 @@ std::optional<PrinterAddress> waitForPrinter(const std::string& deviceURI, Print
     if (address)
         return address;
     say("STATE: +offline-report\n");
-    const bool isMemberOfClass = environment("CLASS").has_value();
+    const bool isMemberOfClass = schedulerVariable("CLASS").has_value();
     do {
         say(kAway);  // each time anew: the filters have messages of their own, and the last one is shown
         std::this_thread::sleep_for(kRetryInterval);
@@ -68,26 +62,14 @@ std::optional<PrinterAddress> waitForPrinter(const std::string& deviceURI, Print
     return address;
 }
 
-// From here on the job is the stock IPP backend's, in this very process: data, signals and exit status are
-// its own.
-int becomeIppBackend(const std::string& uri, char* arguments[]) {
-    std::string address = uri;
-    arguments[0] = address.data();
-    setenv("DEVICE_URI", address.c_str(), 1);
-    const auto program = environment("CUPS_SERVERBIN").value_or(VENTRAS_CUPS_SERVERBIN) + "/backend/ipp";
-    execv(program.c_str(), arguments);
-    std::perror(("ERROR: Unable to start " + program).c_str());
-    return CUPS_BACKEND_FAILED;
-}
-
 int print(char* arguments[]) {
-    const auto deviceURI = environment("DEVICE_URI").value_or(arguments[0]);
+    const auto deviceURI = jobDeviceURI(arguments);
     if (!deviceURI.starts_with(kScheme)) {
         say("ERROR: The queue's device URI is not one of a printer with IPP over USB.\n");
         return CUPS_BACKEND_STOP;
     }
     const auto address = waitForPrinter(deviceURI, serviceOfQueue());
-    return address ? becomeIppBackend(address->uri, arguments) : CUPS_BACKEND_FAILED;
+    return address ? becomeStockBackend("backend/ipp", address->uri, arguments) : CUPS_BACKEND_FAILED;
 }
 
 }  // namespace
