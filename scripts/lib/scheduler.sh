@@ -36,24 +36,57 @@ folder_mode() {
     if ((EUID == 0)); then echo 755; else echo 700; fi
 }
 
-# make_backends DIR: the machine's backends and the agent's own. The stock ones that only root may run ("usb", "lpd")
-# are copied for an ordinary user, whose scheduler would refuse queues for them.
-make_backends() {
-    local part dir=$1
-    mkdir -p "$dir/backend"
-    for part in cgi-bin daemon driver filter monitor notifier; do
+# make_programs DIR: the machine's parts of a scheduler, and the agent's own backends. The stock backends that only root
+# may run ("usb", "lpd") are copied for an ordinary user, whose scheduler would refuse queues for them.
+make_programs() {
+    local part stock=/usr/lib/cups/backend/usb dir=$1 own=$source_dir/build/release/bin
+    mkdir -p "$dir/backend" "$dir/daemon"
+    for part in cgi-bin driver filter monitor notifier; do
         ln -sfn "/usr/lib/cups/$part" "$dir/$part"
     done
-    for part in /usr/lib/cups/backend/*; do
-        if ((EUID == 0)); then
-            ln -sfn "$part" "$dir/backend/${part##*/}"
-        elif [[ -r $part ]]; then
-            install -m 755 "$part" "$dir/backend/"
-        fi
+    for part in /usr/lib/cups/daemon/*; do
+        ln -sfn "$part" "$dir/daemon/${part##*/}"
     done
-    if [[ -x $source_dir/build/release/bin/ippusb ]]; then
-        install -m 755 "$source_dir/build/release/bin/ippusb" "$dir/backend/"
+    for part in /usr/lib/cups/backend/*; do
+        borrow "$part" "$dir/backend/${part##*/}"
+    done
+    [[ -x $own/ippusb ]] && install -m 755 "$own/ippusb" "$dir/backend/"
+    # Where the agent is installed, the stock backend for USB has made way already.
+    [[ -e /usr/lib/cups/daemon/stock-usb ]] && stock=/usr/lib/cups/daemon/stock-usb
+    if [[ -x $own/usb && -r $stock ]]; then
+        borrow "$stock" "$dir/daemon/stock-usb"
+        rm -f "$dir/backend/usb"
+        install -m "$(root_backend_mode)" "$own/usb" "$dir/backend/"
     fi
+}
+
+# borrow PROGRAM LINK
+borrow() {
+    if ((EUID == 0)); then
+        ln -sfn "$1" "$2"
+    elif [[ -r $1 ]]; then
+        install -m 755 "$1" "$2"
+    fi
+}
+
+# A backend that others may not run is run as root, by root's scheduler.
+root_backend_mode() {
+    if ((EUID == 0)); then echo 744; else echo 755; fi
+}
+
+# make_drivers DIR: the machine's data files of a scheduler, with its drivers registered for the agent.
+make_drivers() {
+    local part dir=$1
+    rm -rf "${dir:?}"
+    mkdir -p "$dir/drv" "$dir/model"
+    for part in /usr/share/cups/*; do
+        case ${part##*/} in
+            drv | model) ln -sfn -t "$dir/${part##*/}" "$part"/* 2>/dev/null || true ;;
+            *) ln -sfn "$part" "$dir/${part##*/}" ;;
+        esac
+    done
+    rm -f "$dir/drv/Library" "$dir/model/Library"
+    "$source_dir/data/ventrasagent-register-drivers" "$dir"
 }
 
 write_scheduler_settings() {
@@ -66,7 +99,7 @@ RequestRoot $dir/spool
 TempDir $dir/spool/tmp
 ServerKeychain $dir/etc/ssl
 ServerBin $dir/bin
-DataDir /usr/share/cups
+DataDir $dir/data
 DocumentRoot /usr/share/cups/doc-root
 AccessLog $dir/log/access_log
 ErrorLog $dir/log/error_log
@@ -129,7 +162,8 @@ start_scheduler() {
     if ((EUID == 0)) && ! setpriv --reuid=lp --regid=lp --clear-groups test -x "$dir"; then
         die "user lp cannot enter $dir, but prints from there; set XDG_STATE_HOME to a folder that all may enter"
     fi
-    make_backends "$dir/bin"
+    make_programs "$dir/bin"
+    make_drivers "$dir/data"
     write_scheduler_settings "$dir" "$socket"
     setsid /usr/sbin/cupsd -f -c "$dir/etc/cupsd.conf" -s "$dir/etc/cups-files.conf" \
         </dev/null >>"$dir/log/output" 2>&1 {start_lock}>&- &

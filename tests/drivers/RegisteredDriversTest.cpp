@@ -72,6 +72,20 @@ TEST_F(RegisteredDrivers, MayBePPDFilesInFolders) {
     EXPECT_EQ(kindsOf("Library/Printers/acme/laser.ppd").size(), 1U);
 }
 
+TEST_F(RegisteredDrivers, MayBePPDFilesAmongTheSchedulersOwn) {
+    fs::create_directories(data() / "model/acme");
+    fs::copy_file(fs::path(VENTRAS_SOURCE_DATA_DIR) / "Generic.ppd", data() / "model/acme/laser.ppd");
+    fs::copy_file(fs::path(VENTRAS_SOURCE_DATA_DIR) / "Generic.ppd", data() / "model/other.ppd");
+    fs::create_directory(ppds_ / "zenith");
+    for (int times = 0; times < 2; ++times) {
+        ASSERT_EQ(registerDrivers(), 0);
+        EXPECT_THAT(namesIn(data() / "model/Library/Printers"),
+                    ElementsAre("laser.ppd", "other.ppd", "zenith"));
+    }
+    for (const std::string name : {"laser.ppd", "other.ppd"})
+        EXPECT_EQ(kindsOf("Library/Printers/" + name).size(), 1U) << name;
+}
+
 TEST_F(RegisteredDrivers, FollowThePackagesThatComeAndGo) {
     install("sample.drv");
     install("cupsfilters.drv");
@@ -86,6 +100,17 @@ TEST_F(RegisteredDrivers, MayBeNone) {
     ASSERT_EQ(registerDrivers(), 0);
     EXPECT_THAT(namesIn(drv() / "Library"), IsEmpty());
     EXPECT_THAT(namesIn(data() / "model/Library/Printers"), IsEmpty());
+}
+
+TEST_F(RegisteredDrivers, CanBeTakenAway) {
+    install("sample.drv");
+    fs::create_directory(ppds_ / "acme");
+    ASSERT_EQ(registerDrivers(), 0);
+    for (int times = 0; times < 2; ++times) {
+        EXPECT_EQ(runProgram({VENTRAS_REGISTER_DRIVERS, "--none", data(), ppds_.path()}).exitStatus, 0);
+        EXPECT_THAT(namesIn(drv()), ElementsAre("sample.drv"));
+        EXPECT_FALSE(fs::exists(data() / "model/Library"));
+    }
 }
 
 TEST_F(RegisteredDrivers, AreLinksBesideWhatOthersPutThere) {

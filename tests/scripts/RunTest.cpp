@@ -7,6 +7,8 @@
 #include <thread>
 
 #include "tests/parts/PrivateScheduler.h"
+#include "tests/parts/StockUsbBackend.h"
+#include "tests/parts/UsbBench.h"
 #include "tests/parts/VirtualPrinter.h"
 #include "tests/scripts/ScriptsFolder.h"
 
@@ -33,10 +35,11 @@ bool runs(pid_t process) {
     return process > 0 && kill(process, 0) == 0;
 }
 
-class RunScript : public testing::TestWithParam<bool> {
+class RunInOwnFolder : public testing::Test {
 protected:
+    explicit RunInOwnFolder(std::optional<uid_t> user = {}) : folder_(user) {}
     // The scheduler that a script leaves serving is not the test's child, and would outlive it.
-    ~RunScript() override {
+    ~RunInOwnFolder() override {
         if (const auto scheduler = schedulerOf(kept()); runs(scheduler))
             kill(scheduler, SIGTERM);
     }
@@ -44,7 +47,12 @@ protected:
     fs::path kept() const { return folder_.home() / "state/ventrasagent/cups"; }
     fs::path demonstration() const { return folder_.home() / "state/ventrasagent/demo"; }
 
-    ScriptsFolder folder_{GetParam() ? ordinaryUser() : std::nullopt};
+    ScriptsFolder folder_;
+};
+
+class RunScript : public RunInOwnFolder, public testing::WithParamInterface<bool> {
+protected:
+    RunScript() : RunInOwnFolder(GetParam() ? ordinaryUser() : std::nullopt) {}
 };
 
 INSTANTIATE_TEST_SUITE_P(As, RunScript, testing::Bool(),
@@ -128,10 +136,33 @@ TEST_P(RunScript, UsesTheSchedulerThatAnswers) {
     EXPECT_FALSE(fs::exists(kept()));
 }
 
+TEST_P(RunScript, HasTheAgentsBackendInFrontOfTheStockOne) {
+    const VirtualPrinter printer;
+    ASSERT_EQ(folder_.run("scripts/run", {printer.uri()}).exitStatus, 0);
+    EXPECT_EQ(readFile(kept() / "bin/backend/usb"), readFile(fs::path(VENTRAS_BUILD) / "bin/usb"));
+    EXPECT_EQ(readFile(kept() / "bin/daemon/stock-usb"), readFile(stockUsbBackend()));
+}
+
 TEST_P(RunScript, PassesOnAndExplainsTheAgentsStatus) {
     const auto result = folder_.run("scripts/run", {"ipp://127.0.0.1:9/ipp/print"});
     EXPECT_EQ(result.exitStatus, 255) << story(result);
     EXPECT_TRUE(contains(result.standardError, "ended with 255: no device was found")) << story(result);
+}
+
+using RunScriptWithUsb = RunInOwnFolder;
+
+TEST_F(RunScriptWithUsb, MakesAQueueForAUsbPrinterWithAnInstalledDriver) {
+    UsbBench bench;
+    bench.plugIn("1-4", {.deviceID = "MFG:Brother;CMD:PJL,HBP;MDL:DCP-7030;SN:B7;"});
+    for (const auto& [name, value] : bench.environment())
+        folder_.setVariable(name, value);
+    const auto result = folder_.run("scripts/run", {"-u20971520,0"});
+    ASSERT_EQ(result.exitStatus, 0) << story(result);
+    const auto queue = result.standardOutput.find("Queue ID:");
+    ASSERT_NE(queue, std::string::npos) << story(result);
+    const auto name =
+        result.standardOutput.substr(queue + 9, result.standardOutput.find('\n', queue) - queue - 9);
+    EXPECT_TRUE(contains(readFile(kept() / "etc/ppd" / (name + ".ppd")), "rastertobrlaser")) << story(result);
 }
 
 }  // namespace

@@ -12,7 +12,9 @@ using namespace std::chrono_literals;
 
 ScriptsFolder::ScriptsFolder(std::optional<uid_t> user) : folder_(user) {
     fs::copy(VENTRAS_SCRIPTS, folder_ / "scripts", fs::copy_options::recursive);
-    fs::create_directories(folder_ / "build");
+    for (const char* name : {"build", "data"})
+        fs::create_directories(folder_ / name);
+    fs::copy(VENTRAS_REGISTER_DRIVERS, folder_ / "data");
     fs::create_symlink(VENTRAS_BUILD, folder_ / "build/release");
     for (const char* name : {"home", "commands"})
         fs::create_directories(folder_ / name);
