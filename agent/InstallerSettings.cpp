@@ -8,8 +8,6 @@
 namespace ventras {
 namespace {
 
-constexpr std::string_view kOnePrinter = "Would you like to download and install software for '%@'?";
-constexpr std::string_view kSeveralPrinters = "Would you like to install software for your printers?";
 constexpr std::string_view kPlaceholder = "%@";
 constexpr int kLegalTextType = 2;
 
@@ -32,8 +30,8 @@ PredicateInstallSettings installerSettings(const StringTable& strings, const Res
 
 std::string promptTitle(const StringTable& strings, std::span<const DevicePtr> printers) {
     if (printers.size() != 1)
-        return strings.localizedString(kSeveralPrinters);
-    auto title = strings.localizedString(kOnePrinter);
+        return strings.localizedString("Would you like to install software for your printers?");
+    auto title = strings.localizedString("Would you like to download and install software for '%@'?");
     if (const auto placeholder = title.find(kPlaceholder); placeholder != std::string::npos)
         title.replace(placeholder, kPlaceholder.size(), printers.front()->name().value_or("(null)"));
     return title;

@@ -12,6 +12,7 @@
 #include "ctl/Output.h"
 #include "ctl/Records.h"
 #include "ctl/SchedulerCheck.h"
+#include "ctl/Translation.h"
 #include "drivers/PPDCatalogue.h"
 
 namespace ventras {
@@ -22,12 +23,12 @@ using Records = std::vector<PPDRecord>;
 std::variant<Records, Exit> catalogueFromFile(const std::string& path) {
     std::ifstream file(path, std::ios::binary);
     if (!file) {
-        complain(path + ": cannot be read");
+        complain(translated("%@: cannot be read", path));
         return Exit::NotFound;
     }
     auto records = recordsFromJson(std::string(std::istreambuf_iterator<char>(file), {}));
     if (!records)
-        return usageError(path + ": no JSON array of driver records");
+        return usageError(translated("%@: no JSON array of driver records", path));
     return *std::move(records);
 }
 
@@ -63,20 +64,21 @@ std::optional<DeviceToMatch> deviceFromJson(const std::string& line) {
 
 Exit showDrivers(const Arguments& arguments, Output& output) {
     if (!arguments.operands.empty())
-        return usageError("drivers: takes no operand");
+        return usageError(translated("drivers: takes no operand"));
     const auto drivers = catalogue(arguments);
     if (const auto* exit = std::get_if<Exit>(&drivers))
         return *exit;
     Array rows;
     for (const auto& driver : std::get<Records>(drivers))
         rows.emplace_back(objectOf(driver));
-    output.print(rows, std::array{Column{"ppd_make_and_model", "DRIVER"}, Column{"ppd_name", "NAME"}});
+    output.print(rows, std::array{Column{"ppd_make_and_model", translatable("DRIVER")},
+                                  Column{"ppd_name", translatable("NAME")}});
     return Exit::Success;
 }
 
 Exit showMatches(const Arguments& arguments, Output& output) {
     if (!arguments.operands.empty() && !arguments.areFromStandardInput())
-        return usageError("match: the device is described by options");
+        return usageError(translated("match: the device is described by options"));
     const auto list = catalogue(arguments);
     if (const auto* exit = std::get_if<Exit>(&list))
         return *exit;

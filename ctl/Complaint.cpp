@@ -3,6 +3,7 @@
 #include <cstdio>
 
 #include "ctl/Text.h"
+#include "ctl/Translation.h"
 
 namespace ventras {
 
@@ -12,7 +13,7 @@ void complain(std::string_view message) {
 
 Exit usageError(std::string_view message) {
     complain(message);
-    std::fputs("Try 'ventrasctl --help' for more information.\n", stderr);
+    std::fprintf(stderr, "%s\n", translated("Try 'ventrasctl --help' for more information.").c_str());
     return Exit::Usage;
 }
 

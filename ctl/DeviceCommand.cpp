@@ -7,6 +7,7 @@
 #include "ctl/Complaint.h"
 #include "ctl/Output.h"
 #include "ctl/Services.h"
+#include "ctl/Translation.h"
 #include "devices/ScannerObject.h"
 #include "devices/UsbEnumeration.h"
 #include "devices/UsbInterfaceReader.h"
@@ -16,9 +17,10 @@
 namespace ventras {
 namespace {
 
-constexpr std::array kUsbColumns{Column{"location", "LOCATION"}, Column{"interfaceNumber", "INTERFACE"},
-                                 Column{"vendorID", "VENDOR"}, Column{"productID", "PRODUCT"},
-                                 Column{"deviceID", "DEVICE ID"}};
+constexpr std::array kUsbColumns{
+    Column{"location", translatable("LOCATION")}, Column{"interfaceNumber", translatable("INTERFACE")},
+    Column{"vendorID", translatable("VENDOR")}, Column{"productID", translatable("PRODUCT")},
+    Column{"deviceID", translatable("DEVICE ID")}};
 
 Object usbPrinter(UsbInterfaceReader& reader, const UsbInterfaceService& service) {
     const auto identity = reader.readIdentity(service);
@@ -64,12 +66,12 @@ Object scannerAnswers(ScannerObject& scanner) {
 
 Exit showUsbPrinters(const Arguments& arguments, Output& output) {
     if (!arguments.operands.empty())
-        return usageError("usb: takes no operand");
+        return usageError(translated("usb: takes no operand"));
     Services services;
     auto& registry = services.platform().usb;
     const auto interfaces = registry.matchingInterfaces(kUsbPrinterInterfaces);
     if (!interfaces) {
-        complain("the USB cannot be looked at");
+        complain(translated("the USB cannot be looked at"));
         return Exit::Unreachable;
     }
     UsbInterfaceReader reader(registry);
@@ -82,14 +84,14 @@ Exit showUsbPrinters(const Arguments& arguments, Output& output) {
 
 Exit showScanner(const Arguments& arguments, Output& output) {
     if (arguments.operands.size() != 1)
-        return usageError("scanner: which description?");
+        return usageError(translated("scanner: which description?"));
     Services services;
     UsbEnumeration usb(services.platform(), services.drivers(), services.platform().usb);
     const auto scanner = ScannerObject::scannerObjectWithString(arguments.operands.front(), usb,
                                                                 services.platform().computerName);
     if (!scanner) {
         output.printNull();
-        complain("not the description of a scanner");
+        complain(translated("not the description of a scanner"));
         return Exit::NotFound;
     }
     output.print(scannerAnswers(*scanner));
@@ -98,7 +100,7 @@ Exit showScanner(const Arguments& arguments, Output& output) {
 
 Exit showPredicate(const Arguments& arguments, Output& output) {
     if (arguments.operands.empty())
-        return usageError("predicate: for which ID?");
+        return usageError(translated("predicate: for which ID?"));
     const auto predicate = DownloadTriggerOperation::predicateForUpdateStrings(arguments.operands);
     if (!predicate) {
         output.printNull();

@@ -4,6 +4,7 @@
 #include "ctl/Json.h"
 #include "ctl/LineByLine.h"
 #include "ctl/Output.h"
+#include "ctl/Translation.h"
 #include "deviceid/PMDictionaryAdditions.h"
 #include "deviceid/PMStringAdditions.h"
 
@@ -75,7 +76,7 @@ Exit showDeviceIDs(const Arguments& arguments, Output& output) {
         return answerLines(output,
                            [](const std::string& line) { return std::optional<Value>{answersFor(line)}; });
     if (arguments.operands.empty())
-        return usageError("device-id: which device ID?");
+        return usageError(translated("device-id: which device ID?"));
     for (const auto& deviceID : arguments.operands)
         output.print(answersFor(deviceID));
     return Exit::Success;
@@ -91,7 +92,7 @@ Exit showDescription(const Arguments& arguments, Output& output) {
     for (const auto& pair : arguments.operands) {
         const auto equals = pair.find('=');
         if (equals == std::string::npos)
-            return usageError("txt: '" + pair + "' is no KEY=VALUE");
+            return usageError(translated("txt: '%@' is no KEY=VALUE", pair));
         description.insert_or_assign(pair.substr(0, equals), pair.substr(equals + 1));
     }
     output.print(answersFor(description));

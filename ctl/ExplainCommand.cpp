@@ -8,6 +8,7 @@
 #include "ctl/Output.h"
 #include "ctl/SchedulerCheck.h"
 #include "ctl/Services.h"
+#include "ctl/Translation.h"
 #include "devices/IPPUSBObject.h"
 #include "devices/ScannerObject.h"
 #include "devices/UsbEnumeration.h"
@@ -94,7 +95,7 @@ Object withArgument(const std::string& argument, Object object) {
 
 Exit explainArguments(const Arguments& arguments, Output& output) {
     if (arguments.operands.empty())
-        return usageError("explain: which arguments?");
+        return usageError(translated("explain: which arguments?"));
     Services services;
     const auto unreachable = schedulerIsUnreachable();
     ArgumentReader reader(services);

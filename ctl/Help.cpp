@@ -1,5 +1,7 @@
 #include "ctl/Help.h"
 
+#include "ctl/Translation.h"
+
 namespace ventras {
 namespace {
 
@@ -23,11 +25,11 @@ std::string synopsis(const Command& command) {
 }
 
 std::string optionEntries(std::span<const Option> options) {
-    std::string text = "\nOptions:\n";
+    std::string text = "\n" + translated("Options:") + "\n";
     for (const auto& option : options)
         text += entry(std::string("--") + option.name +
                           (option.valueName == nullptr ? "" : std::string("=") + option.valueName),
-                      option.meaning);
+                      translated(option.meaning));
     return text;
 }
 
@@ -35,17 +37,20 @@ std::string optionEntries(std::span<const Option> options) {
 
 std::string programHelp(std::span<const Command> commands, std::span<const Option> options) {
     std::string text =
-        "Usage: ventrasctl [OPTION]... COMMAND [ARGUMENT]...\n"
-        "Shows what the printer agent sees, decides and would do. It changes nothing.\n"
-        "\nCommands:\n";
+        translated("Usage: ventrasctl %@", "[OPTION]... COMMAND [ARGUMENT]...") + "\n" +
+        translated("Shows what the printer agent sees, decides and would do. It changes nothing.") + "\n\n" +
+        translated("Commands:") + "\n";
     for (const auto& command : commands)
-        text += entry(synopsis(command), command.summary);
-    return text + optionEntries(options) +
-           "\nExit status: 0 = done, 1 = not found, 2 = wrong usage, 3 = a service does not answer.\n";
+        text += entry(synopsis(command), translated(command.summary));
+    return text + optionEntries(options) + "\n" +
+           translated(
+               "Exit status: 0 = done, 1 = not found, 2 = wrong usage, 3 = a service does not answer.") +
+           "\n";
 }
 
 std::string commandHelp(const Command& command, std::span<const Option> options) {
-    return "Usage: ventrasctl " + synopsis(command) + "\n" + command.summary + "\n" + optionEntries(options);
+    return translated("Usage: ventrasctl %@", synopsis(command)) + "\n" + translated(command.summary) + "\n" +
+           optionEntries(options);
 }
 
 }  // namespace ventras

@@ -5,6 +5,7 @@
 
 #include "ctl/Complaint.h"
 #include "ctl/Output.h"
+#include "ctl/Translation.h"
 
 namespace ventras {
 
@@ -21,7 +22,7 @@ Exit answerLines(Output& output, const std::function<std::optional<Value>(const 
             break;
         if (value)
             continue;
-        complain("line " + std::to_string(number) + " is not what this command reads");
+        complain(translated("line %@ is not what this command reads", std::to_string(number)));
         exit = Exit::Usage;
     }
     return exit;

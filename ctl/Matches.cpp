@@ -4,6 +4,7 @@
 
 #include "ctl/Output.h"
 #include "ctl/Records.h"
+#include "ctl/Translation.h"
 
 namespace ventras {
 
@@ -27,8 +28,10 @@ void printMatches(const Array& matches, Output& output) {
         row.insert(row.end(), members.begin() + 1, members.end());
         rows.emplace_back(std::move(row));
     }
-    output.print(rows, std::array{Column{"kind", "KIND"}, Column{"ppd_make_and_model", "DRIVER"},
-                                  Column{"ppd_name", "NAME"}, Column{"reason", "WHY"}});
+    output.print(
+        rows,
+        std::array{Column{"kind", translatable("KIND")}, Column{"ppd_make_and_model", translatable("DRIVER")},
+                   Column{"ppd_name", translatable("NAME")}, Column{"reason", translatable("WHY")}});
 }
 
 }  // namespace ventras

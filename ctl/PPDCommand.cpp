@@ -10,6 +10,7 @@
 #include "ctl/LineByLine.h"
 #include "ctl/Output.h"
 #include "ctl/Records.h"
+#include "ctl/Translation.h"
 #include "drivers/PPDManager.h"
 
 namespace ventras {
@@ -62,14 +63,14 @@ std::optional<unsigned> kindOf(const Value& element) {
 
 Exit showPPDs(const Arguments& arguments, Output& output) {
     if (arguments.operands.empty())
-        return usageError("ppd: which file?");
+        return usageError(translated("ppd: which file?"));
     auto exit = Exit::Success;
     for (const auto& path : arguments.operands) {
         const auto record = PPDManager::parsePPD(path);
         output.print(answersFor(path, record));
         if (record)
             continue;
-        complain(path + ": no PPD that can be opened");
+        complain(translated("%@: no PPD that can be opened", path));
         exit = Exit::NotFound;
     }
     return exit;
@@ -77,23 +78,24 @@ Exit showPPDs(const Arguments& arguments, Output& output) {
 
 Exit showKinds(const Arguments& arguments, Output& output) {
     if (!arguments.operands.empty() && !arguments.areFromStandardInput())
-        return usageError("kind: the records come on standard input");
+        return usageError(translated("kind: the records come on standard input"));
     const auto input = parseJson(readStandardInput());
     const auto* array = input ? std::get_if<Array>(&*input) : nullptr;
     if (array == nullptr)
-        return usageError("kind: standard input is no JSON array");
+        return usageError(translated("kind: standard input is no JSON array"));
     Array kinds, rows;
     for (const auto& element : *array) {
         const auto kind = kindOf(element);
         if (!kind)
-            return usageError("kind: element " + std::to_string(kinds.size() + 1) + " is no record");
+            return usageError(translated("kind: element %@ is no record", std::to_string(kinds.size() + 1)));
         kinds.emplace_back(*kind);
         rows.push_back(Object{{"kind", *kind}, {"meaning", describeKind(*kind)}});
     }
     if (output.isForProgram())
         output.printJson(kinds);
     else
-        output.print(rows, std::array{Column{"kind", "KIND"}, Column{"meaning", "MEANING"}});
+        output.print(rows, std::array{Column{"kind", translatable("KIND")},
+                                      Column{"meaning", translatable("MEANING")}});
     return Exit::Success;
 }
 

@@ -11,14 +11,16 @@
 #include "ctl/Complaint.h"
 #include "ctl/Output.h"
 #include "ctl/PackageOffer.h"
+#include "ctl/Translation.h"
 
 namespace ventras {
 namespace {
 
 using Operands = std::span<const std::string>;
 
-constexpr std::array kColumns{Column{"name", "PACKAGE"}, Column{"tier", "TIER"}, Column{"version", "VERSION"},
-                              Column{"title", "TITLE"}};
+constexpr std::array kColumns{Column{"name", translatable("PACKAGE")}, Column{"tier", translatable("TIER")},
+                              Column{"version", translatable("VERSION")},
+                              Column{"title", translatable("TITLE")}};
 
 const Value& member(const Object& object, std::string_view key) {
     return *find(object, key);
@@ -37,7 +39,7 @@ void showOffer(const Object& offer, Output& output) {
 
 Exit lookUp(const Arguments& arguments, Operands ids, Output& output) {
     if (ids.size() != 1)
-        return usageError("catalogue lookup: which ID?");
+        return usageError(translated("catalogue lookup: which ID?"));
     const auto file = arguments.value("file");
     const auto reading = file ? DriverCatalogue::read(*file) : installedCatalogue();
     if (!reading.catalogue) {
@@ -93,7 +95,7 @@ bool writeWhole(const std::filesystem::path& path, const std::string& text) {
 
 Exit build(const Arguments& arguments, Operands folders, Output& output) {
     if (folders.empty())
-        return usageError("catalogue build: from which packages' folders?");
+        return usageError(translated("catalogue build: from which packages' folders?"));
     CatalogueBuilder builder;
     for (const auto& folder : folders) {
         auto reading = readUnpackedPackage(folder);
@@ -106,12 +108,12 @@ Exit build(const Arguments& arguments, Operands folders, Output& output) {
     const auto catalogue = builder.build(arguments.value("release").value_or(thisRelease()));
     const auto text = catalogueText(catalogue);
     if (!text) {
-        complain("these packages, or the release, cannot stand in a catalogue");
+        complain(translated("these packages, or the release, cannot stand in a catalogue"));
         return Exit::NotFound;
     }
     const auto path = arguments.value("output");
     if (path && !writeWhole(*path, *text)) {
-        complain(*path + ": cannot be written");
+        complain(translated("%@: cannot be written", *path));
         return Exit::Unreachable;
     }
     output.print(summaryOf(catalogue, text->size(), output));
@@ -132,7 +134,7 @@ Exit showPackages(const Arguments& arguments, Output& output) {
     for (const auto& task : kTasks)
         if (!operands.empty() && operands.front() == task.name)
             return task.run(arguments, operands.subspan(1), output);
-    return usageError("catalogue: 'lookup ID' or 'build DIR...'?");
+    return usageError(translated("catalogue: 'lookup ID' or 'build DIR...'?"));
 }
 
 }  // namespace ventras

@@ -2,15 +2,18 @@
 
 #include "ctl/CommandLine.h"
 #include "ctl/Exit.h"
+#include "ctl/Translation.h"
 
 namespace ventras {
 
 class Output;
 
 inline constexpr Option kPackageOptions[] = {
-    {"file", "FILE", "lookup: in this catalogue, instead of the installed one"},
-    {"output", "FILE", "build: keep the catalogue there; without, only show what it would cover"},
-    {"release", "RELEASE", "build: for this release, instead of this system's, e.g. \"debian 12\""},
+    {"file", "FILE", translatable("lookup: in this catalogue, instead of the installed one")},
+    {"output", "FILE",
+     translatable("build: keep the catalogue there; without, only show what it would cover")},
+    {"release", "RELEASE",
+     translatable("build: for this release, instead of this system's, e.g. \"debian 12\"")},
 };
 
 /// The catalogue of driver packages: what it says of a device ("lookup ID"), and how it is made from unpacked

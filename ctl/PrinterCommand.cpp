@@ -5,6 +5,7 @@
 #include "ctl/Output.h"
 #include "ctl/Records.h"
 #include "ctl/Services.h"
+#include "ctl/Translation.h"
 #include "deviceid/TextScan.h"
 #include "devices/IPPUSBObject.h"
 #include "devices/VellumProfilePrinterObject.h"
@@ -41,10 +42,10 @@ Value textUnder(const DeviceDescription& description, std::string_view key) {
 
 Exit showPrinter(const Arguments& arguments, Output& output) {
     if (arguments.operands.size() != 1)
-        return usageError("printer: which URI?");
+        return usageError(translated("printer: which URI?"));
     const auto& uri = arguments.operands.front();
     if (!uri.starts_with("ipp://") && !uri.starts_with("ipps://"))
-        return usageError("printer: '" + uri + "' begins neither with ipp:// nor with ipps://");
+        return usageError(translated("printer: '%@' begins neither with ipp:// nor with ipps://", uri));
     Services services;
     VellumProfilePrinterObject printer(services.platform(), services.drivers(), uri);
     output.print(Object{{"attributes", objectOf(printer.attributes())},
@@ -54,13 +55,13 @@ Exit showPrinter(const Arguments& arguments, Output& output) {
                         {"driverInfo", infoWithGenericDriver(printer)}});
     if (!printer.attributes().empty())
         return Exit::Success;
-    complain(uri + ": " + printer.difficulty().value_or("it says nothing of itself"));
+    complain(uri + ": " + printer.difficulty().value_or(translated("it says nothing of itself")));
     return Exit::Unreachable;
 }
 
 Exit showService(const Arguments& arguments, Output& output) {
     if (arguments.operands.size() != 1)
-        return usageError("service: which name?");
+        return usageError(translated("service: which name?"));
     Services services;
     IPPUSBObject printer(services.drivers(), arguments.operands.front());
     const bool isFound = printer.txtDictionary().has_value();
@@ -75,7 +76,7 @@ Exit showService(const Arguments& arguments, Output& output) {
                         {"driverInfo", isFound ? infoWithGenericDriver(printer) : Value{}}});
     if (isFound)
         return Exit::Success;
-    complain(arguments.operands.front() + ": no such service, or nobody answers for it");
+    complain(translated("%@: no such service, or nobody answers for it", arguments.operands.front()));
     return Exit::NotFound;
 }
 

@@ -7,6 +7,7 @@
 #include "ctl/Output.h"
 #include "ctl/SchedulerCheck.h"
 #include "ctl/Services.h"
+#include "ctl/Translation.h"
 #include "queues/QueueInventory.h"
 #include "queues/QueueNaming.h"
 
@@ -27,7 +28,7 @@ Object namesFor(const std::string& name, bool strips, PrintSystemService* printS
 
 Exit showQueues(const Arguments& arguments, Output& output) {
     if (!arguments.operands.empty())
-        return usageError("queues: takes no operand");
+        return usageError(translated("queues: takes no operand"));
     Services services;
     const auto queues = QueueInventory(services.platform()).existingQueues();
     if (const auto unreachable = queues ? std::nullopt : schedulerIsUnreachable())
@@ -37,13 +38,14 @@ Exit showQueues(const Arguments& arguments, Output& output) {
         rows.push_back(Object{{"printer-name", queue.printerName},
                               {"device-uri", queue.deviceURI},
                               {"printer-type", queue.printerType}});
-    output.print(rows, std::array{Column{"printer-name", "QUEUE"}, Column{"device-uri", "DEVICE"}});
+    output.print(rows, std::array{Column{"printer-name", translatable("QUEUE")},
+                                  Column{"device-uri", translatable("DEVICE")}});
     return Exit::Success;
 }
 
 Exit showNames(const Arguments& arguments, Output& output) {
     if (arguments.operands.size() != 1)
-        return usageError("name: which name?");
+        return usageError(translated("name: which name?"));
     Services services;
     auto* printSystem = schedulerIsUnreachable() ? nullptr : &services.printSystem();
     const auto answer = [&](const std::string& name) {

@@ -7,6 +7,7 @@
 #include "ctl/Evidence.h"
 #include "ctl/Output.h"
 #include "ctl/Services.h"
+#include "ctl/Translation.h"
 #include "devices/TXTRecord.h"
 #include "platform/Deadline.h"
 #include "platform/ImageDeviceBrowser.h"
@@ -21,8 +22,9 @@ constexpr std::chrono::seconds kListeningTime{3};
 // All that the agent ever looks for: scanners at this computer and those of IPP-over-USB printers.
 constexpr std::uint64_t kDeviceTypes = 258 | 0xfe00;
 
-constexpr std::array kColumns{Column{"transport", "TRANSPORT"}, Column{"uuidString", "UUID"},
-                              Column{"serialNumber", "SERIAL NUMBER"}, Column{"modulePath", "MODULE"}};
+constexpr std::array kColumns{
+    Column{"transport", translatable("TRANSPORT")}, Column{"uuidString", translatable("UUID")},
+    Column{"serialNumber", translatable("SERIAL NUMBER")}, Column{"modulePath", translatable("MODULE")}};
 
 Object rowOf(const ImageDevice& device) {
     return {{"transport", device.transport},
@@ -39,7 +41,7 @@ Object rowOf(const ImageDevice& device) {
 
 Exit showScanners(const Arguments& arguments, Output& output) {
     if (!arguments.operands.empty())
-        return usageError("scanners: takes no operand");
+        return usageError(translated("scanners: takes no operand"));
     Services services;
     const auto browser = services.platform().makeImageDeviceBrowser();
     browser->setBrowsedDeviceTypeMask(kDeviceTypes);

@@ -1,6 +1,7 @@
 #include "ctl/SchedulerCheck.h"
 
 #include "ctl/Complaint.h"
+#include "ctl/Translation.h"
 #include "platform/IppConnection.h"
 
 namespace ventras {
@@ -9,7 +10,7 @@ std::optional<Exit> schedulerIsUnreachable() {
     const auto scheduler = IppConnection::toScheduler();
     if (scheduler.connected())
         return std::nullopt;
-    complain("the print scheduler does not answer: " + scheduler.failure());
+    complain(translated("the print scheduler does not answer: %@", scheduler.failure()));
     return Exit::Unreachable;
 }
 

@@ -6,6 +6,7 @@
 #include <memory>
 #include <vector>
 
+#include "ctl/Translation.h"
 #include "platform/Utf8.h"
 
 namespace ventras {
@@ -27,7 +28,9 @@ std::string withoutControls(const std::string& text) {
 
 struct Writer {
     std::string operator()(std::monostate) const { return "-"; }
-    std::string operator()(bool flag) const { return flag ? "yes" : "no"; }
+    std::string operator()(bool flag) const {
+        return translated(flag ? translatable("yes") : translatable("no"));
+    }
     std::string operator()(std::int64_t number) const { return std::to_string(number); }
     std::string operator()(double number) const { return std::to_string(number); }
     std::string operator()(const std::string& text) const { return withoutControls(text); }
@@ -91,7 +94,7 @@ std::string textTable(const Array& rows, std::span<const Column> columns) {
         return "";
     std::vector<Cells> lines(1);
     for (const auto& column : columns)
-        lines.front().emplace_back(column.heading);
+        lines.front().push_back(translated(column.heading));
     for (const auto& row : rows)
         lines.push_back(rowOf(row, columns));
     return aligned(lines);

@@ -9,15 +9,16 @@
 #include "ctl/Complaint.h"
 #include "ctl/Help.h"
 #include "ctl/Output.h"
+#include "ctl/Translation.h"
 
 namespace {
 
 using namespace ventras;
 
 constexpr Option kGeneralOptions[] = {
-    {"json", nullptr, "print JSON, for programs"},
-    {"help", nullptr, "show this help and exit"},
-    {"version", nullptr, "show the version and exit"},
+    {"json", nullptr, translatable("print JSON, for programs")},
+    {"help", nullptr, translatable("show this help and exit")},
+    {"version", nullptr, translatable("show the version and exit")},
 };
 
 std::vector<Option> optionsOf(const Command& command) {
@@ -48,7 +49,7 @@ Exit run(const Command& command, std::span<char*> arguments, Reader reader) {
     const auto exit = command.run(*parsed, output);
     if (output.flush())
         return exit;
-    complain("the output could not be written");
+    complain(translated("the output could not be written"));
     return Exit::Unreachable;
 }
 
@@ -59,12 +60,12 @@ Exit run(std::span<char*> arguments) {
     if (isAnsweredByText(*general, programHelp(commands(), kGeneralOptions)))
         return Exit::Success;
     if (general->operands.empty())
-        return usageError("which command?");
+        return usageError(translated("which command?"));
     const auto& name = general->operands.front();
     const auto command =
         std::ranges::find_if(commands(), [&](const Command& known) { return name == known.name; });
     if (command == commands().end())
-        return usageError("'" + name + "' is no command");
+        return usageError(translated("'%@' is no command", name));
     return run(*command, arguments.last(general->operands.size() - 1),
                general->has("json") ? Reader::Program : Reader::People);
 }
