@@ -20,11 +20,14 @@ using PlistText = std::unique_ptr<char, decltype([](char* text) { std::free(text
 // Deeper nesting than this comes from no one who means well.
 constexpr int kDeepest = 64;
 
-// libplist recurses as deep as the data nests, before we see any of it; so many containers, and so short a
-// binary list, cannot nest deep enough to exhaust a stack.
-constexpr std::size_t kLongestXml = std::size_t{4} * 1024 * 1024;
-constexpr std::size_t kMostXmlContainers = 64 * 1024;
-constexpr std::size_t kLongestBinary = 128 * 1024;
+// libplist recurses as deep as the data nests, before we see any of it; so many containers cannot nest deep
+// enough to exhaust a stack.
+constexpr std::size_t kLongest = std::size_t{4} * 1024 * 1024;
+constexpr std::size_t kMostContainers = 64 * 1024;
+
+// The binary form stays outside: a NUL in one of its UTF-16 keys makes libplist abort the process, and nobody
+// who writes lists for us uses it.
+constexpr std::string_view kBinaryForm = "bplist";
 
 std::size_t countOf(std::string_view wanted, std::string_view text) {
     std::size_t count = 0;
@@ -34,9 +37,10 @@ std::size_t countOf(std::string_view wanted, std::string_view text) {
     return count;
 }
 
-bool isReasonableXml(std::string_view text) {
-    return text.size() <= kLongestXml && text.find('\0') == std::string_view::npos &&
-           countOf("<array", text) + countOf("<dict", text) <= kMostXmlContainers;
+bool isReasonable(std::string_view text) {
+    return !text.starts_with(kBinaryForm) && text.size() <= kLongest &&
+           text.find('\0') == std::string_view::npos &&
+           countOf("<array", text) + countOf("<dict", text) <= kMostContainers;
 }
 
 bool fitsXml(std::string_view text) {
@@ -150,13 +154,10 @@ std::optional<std::string> xmlPropertyList(const PropertyValue& value) {
 }
 
 std::optional<PropertyValue> parsePropertyList(std::string_view data) {
-    const bool isBinary = data.size() < kLongestBinary &&
-                          plist_is_binary(data.data(), static_cast<std::uint32_t>(data.size())) != 0;
-    if (!isBinary && !isReasonableXml(data))
+    if (!isReasonable(data))
         return std::nullopt;
     plist_t node = nullptr;
-    const auto parse = isBinary ? plist_from_bin : plist_from_xml;
-    parse(data.data(), static_cast<std::uint32_t>(data.size()), &node);
+    plist_from_xml(data.data(), static_cast<std::uint32_t>(data.size()), &node);
     const PlistPtr root{node};
     return root ? read(root.get(), 0) : std::nullopt;
 }

@@ -13,10 +13,9 @@ namespace ventras {
 ///         line ends.
 std::optional<std::string> xmlPropertyList(const PropertyValue& value);
 
-/// Reads an XML or binary property list.
-/// @return absent when it does not parse, is longer than 4 MiB (binary: 128 KiB), or has more than 65536
-/// arrays
-///         and dictionaries. Dates, data and real numbers are left out of their container.
+/// Reads an XML property list.
+/// @return absent when it does not parse, is in the binary form, is longer than 4 MiB, or has more than 65536
+///         arrays and dictionaries. Dates, data and real numbers are left out of their container.
 std::optional<PropertyValue> parsePropertyList(std::string_view data);
 
 }  // namespace ventras
