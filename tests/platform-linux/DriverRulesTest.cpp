@@ -11,6 +11,8 @@
 namespace ventras {
 namespace {
 
+using namespace std::string_literals;
+
 class DriverRules : public testing::Test {
 protected:
     PpdFile open(std::string_view text) { return PpdFile::open(folder_.write("driver.ppd", text)); }
@@ -64,8 +66,14 @@ TEST_F(DriverRules, RefuseFilterLinesThatDoNotParse) {
 }
 
 TEST_F(DriverRules, LetAPpdWithoutFiltersPass) {
-    for (const auto kind : {DriverKind::Driverless, DriverKind::Catalogue, DriverKind::ScannerOnly})
+    for (const auto kind : {DriverKind::Driverless, DriverKind::Catalogue})
         EXPECT_TRUE(accepts(ppdWith(""), kind));
+}
+
+TEST_F(DriverRules, LetScannerQueuesHaveAPpdOnlyThatSaysSo) {
+    EXPECT_FALSE(accepts(ppdWith(""), DriverKind::ScannerOnly));
+    // A quotation mark in a name takes the next line into the text that it opens.
+    EXPECT_FALSE(accepts(scannerPpdText("A\"=*B: \"C: \""), DriverKind::ScannerOnly));
 }
 
 TEST_F(DriverRules, LetScannerQueuesHaveNoFilterAtAll) {
@@ -131,6 +139,40 @@ TEST_F(DriverRules, LetNoReplacementAddAFilter) {
     EXPECT_TRUE(objectionToReplacement(present, open(filter1("rastertoother"))));
     EXPECT_TRUE(objectionToReplacement(present, open(filter2("-"))));
     EXPECT_TRUE(objectionToReplacement(present, open("no ppd")));
+}
+
+// foomatic-rip runs what these lines say. It reads line by line, whatever libcups takes for one text.
+const std::string kCommand = "*FoomaticRIPCommandLine: \"gs -q\"\n";
+
+TEST_F(DriverRules, LetCatalogueDriversAloneHaveCommands) {
+    for (const auto& lines :
+         {kCommand, "*QLScannerUUID: \"x\n" + kCommand, "*foomaticripoptionsetting A=B: \"-x\"\n"s}) {
+        EXPECT_TRUE(accepts(ppdWith(lines), DriverKind::Catalogue)) << lines;
+        EXPECT_FALSE(accepts(ppdWith(lines), DriverKind::Driverless)) << lines;
+        EXPECT_FALSE(accepts(scannerPpdText() + lines, DriverKind::ScannerOnly)) << lines;
+    }
+}
+
+TEST_F(DriverRules, SeeAFilterThatIsHiddenInAText) {
+    const std::string hidden = "*QLScannerUUID: \"x\n*cupsFilter: \"application/pdf 0 evil\"\n";
+    EXPECT_FALSE(accepts(driverlessPpdText() + hidden, DriverKind::Driverless));
+    EXPECT_FALSE(accepts(scannerPpdText() + hidden, DriverKind::ScannerOnly));
+}
+
+TEST_F(DriverRules, LetAReplacementKeepOrDropCommands) {
+    const auto present = open(ppdWith(kCommand));
+    EXPECT_FALSE(objectionToReplacement(present, open(ppdWith(kCommand + "*QLScannerUUID: \"u\"\n"))));
+    EXPECT_FALSE(objectionToReplacement(present, open(ppdWith(""))));
+}
+
+TEST_F(DriverRules, LetNoReplacementAddACommand) {
+    const auto present = open(ppdWith(kCommand));
+    for (const auto* injected :
+         {"u\"\n*FoomaticRIPCommandLine: \"evil", "u\n*FoomaticRIPCommandLine: evil",
+          "u\"\r*FOOMATICRIPCommandLine: \"evil", "u\n*cupsFilter: \"application/pdf 0 evil"})
+        EXPECT_TRUE(objectionToReplacement(
+            present, open(ppdWith(kCommand + "*QLScannerUUID: \"" + injected + "\"\n"))))
+            << injected;
 }
 
 TEST(PpdFile, SendsWhatItLookedAtEvenIfTheFileIsReplacedMeanwhile) {

@@ -51,8 +51,8 @@ bool isPermitted(std::string_view program, DriverKind kind) {
     return false;
 }
 
-std::string objectionTo(const PpdFilter& filter, std::string_view why) {
-    return "the PPD's filter line \"" + filter.line + "\" " + std::string(why);
+std::string objectionTo(const std::string& line, std::string_view why) {
+    return "the PPD's filter line \"" + line + "\" " + std::string(why);
 }
 
 }  // namespace
@@ -64,20 +64,25 @@ std::optional<std::string> objectionToDriver(const PpdFile& ppd, DriverKind kind
     const auto bad = std::ranges::find_if(ppd.filters(), [effective](const PpdFilter& filter) {
         return hasControlCharacters(filter.line) || !isPermitted(filter.program, effective);
     });
-    if (bad == ppd.filters().end())
-        return std::nullopt;
-    return objectionTo(*bad, "is none of its driver's");
+    if (bad != ppd.filters().end())
+        return objectionTo(bad->line, "is none of its driver's");
+    if (effective != DriverKind::Catalogue && ppd.codeLines().size() != ppd.filters().size())
+        return "the PPD has filter lines within its texts, or commands for a filter";
+    if (kind == DriverKind::ScannerOnly && !ppd.isScannerOnly())
+        return "the PPD of a scanner does not say that it is one";
+    return std::nullopt;
 }
 
 std::optional<std::string> objectionToReplacement(const PpdFile& present, const PpdFile& replacement) {
     if (!replacement.defect().empty())
         return replacement.defect();
-    const auto added = std::ranges::find_if(replacement.filters(), [&](const PpdFilter& filter) {
-        return std::ranges::find(present.filters(), filter.line, &PpdFilter::line) == present.filters().end();
-    });
-    if (added == replacement.filters().end())
-        return std::nullopt;
-    return objectionTo(*added, "is not one of the queue's present driver");
+    for (const auto& filter : replacement.filters())
+        if (std::ranges::find(present.filters(), filter.line, &PpdFilter::line) == present.filters().end())
+            return objectionTo(filter.line, "is not one of the queue's present driver");
+    for (const auto& line : replacement.codeLines())
+        if (std::ranges::find(present.codeLines(), line) == present.codeLines().end())
+            return objectionTo(line, "is not one of the queue's present driver");
+    return std::nullopt;
 }
 
 }  // namespace ventras

@@ -5,6 +5,8 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <algorithm>
+#include <array>
 #include <cctype>
 #include <optional>
 #include <system_error>
@@ -50,9 +52,21 @@ struct FilterKeyword {
 };
 constexpr FilterKeyword kFilterKeywords[] = {{"cupsFilter", 1}, {"cupsFilter2", 2}, {"cupsPreFilter", 1}};
 
+constexpr std::string_view kCodeKeywords[] = {"*cupsFilter", "*cupsPreFilter", "*FoomaticRIP"};
+
+bool isCode(std::string_view line) {
+    return std::ranges::any_of(kCodeKeywords, [line](std::string_view keyword) {
+        return line.size() >= keyword.size() && strncasecmp(line.data(), keyword.data(), keyword.size()) == 0;
+    });
+}
+
 // libcups closes the descriptor that it is given.
+int duplicated(int descriptor) {
+    return fcntl(descriptor, F_DUPFD_CLOEXEC, 0);
+}
+
 PpdPtr openDuplicate(int descriptor) {
-    const int duplicate = fcntl(descriptor, F_DUPFD_CLOEXEC, 0);
+    const int duplicate = duplicated(descriptor);
     return PpdPtr{duplicate < 0 ? nullptr : ppdOpenFd(duplicate)};
 }
 
@@ -91,6 +105,7 @@ void PpdFile::read() {
         return;
     }
     collectFilters(ppd.get());
+    collectCodeLines();
     for (auto* entry = ppdFindAttr(ppd.get(), "QLScannerOnly", nullptr); entry != nullptr;
          entry = ppdFindNextAttr(ppd.get(), "QLScannerOnly", nullptr))
         isScannerOnly_ = isScannerOnly_ || (entry->value != nullptr && strcasecmp(entry->value, "True") == 0);
@@ -104,6 +119,15 @@ void PpdFile::collectFilters(ppd_file_t* ppd) {
             const std::string value = entry->value == nullptr ? "" : entry->value;
             filters_.push_back({std::string(name) + " " + value, programIn(value, typeCount)});
         }
+}
+
+void PpdFile::collectCodeLines() {
+    const int duplicate = duplicated(descriptor());
+    const CupsFilePtr text{duplicate < 0 ? nullptr : cupsFileOpenFd(duplicate, "r")};
+    std::array<char, 1024> line{};
+    while (text && cupsFileGets(text.get(), line.data(), line.size()) != nullptr)
+        if (isCode(line.data()))
+            codeLines_.emplace_back(line.data());
 }
 
 }  // namespace ventras

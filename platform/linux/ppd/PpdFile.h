@@ -31,16 +31,22 @@ public:
     /// Every filter line, in the order of cupsFilter, cupsFilter2, cupsPreFilter.
     const std::vector<PpdFilter>& filters() const { return filters_; }
 
+    /// Every line that begins as a filter line does, or as one that the filter foomatic-rip runs as a
+    /// command: as readers see them that know no texts of several lines, as libcups does.
+    const std::vector<std::string>& codeLines() const { return codeLines_; }
+
     /// Whether the PPD says, once or more, that its queue is a scanner without a printer.
     bool isScannerOnly() const { return isScannerOnly_; }
 
 private:
     void read();
     void collectFilters(ppd_file_t* ppd);
+    void collectCodeLines();
 
     FileDescriptor file_;
     std::string defect_;
     std::vector<PpdFilter> filters_;
+    std::vector<std::string> codeLines_;
     bool isScannerOnly_ = false;
 };
 
