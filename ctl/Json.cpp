@@ -81,10 +81,30 @@ std::optional<Value> read(const Json& json, int depth) {
     }
 }
 
+// JSON lets DEL and the C1 control characters stand as they are, but people look at it on terminals, which
+// obey them. Outside of texts there are none.
+std::string withEscapedControls(std::string_view json) {
+    constexpr std::string_view kDigits = "0123456789abcdef";
+    std::string escaped;
+    for (std::size_t i = 0; i < json.size(); ++i) {
+        auto byte = static_cast<unsigned char>(json[i]);
+        const bool leadsToC1 =
+            byte == 0xC2 && i + 1 < json.size() && static_cast<unsigned char>(json[i + 1]) < 0xA0;
+        if (leadsToC1)
+            byte = static_cast<unsigned char>(json[++i]);
+        if (leadsToC1 || byte == 0x7F)
+            escaped.append("\\u00").append({kDigits[byte >> 4U], kDigits[byte & 15U]});
+        else
+            escaped += json[i];
+    }
+    return escaped;
+}
+
 }  // namespace
 
 std::string toJson(const Value& value) {
-    return std::visit(Writer{}, value).dump(-1, ' ', false, Json::error_handler_t::replace);
+    return withEscapedControls(
+        std::visit(Writer{}, value).dump(-1, ' ', false, Json::error_handler_t::replace));
 }
 
 std::optional<Value> parseJson(std::string_view text) {

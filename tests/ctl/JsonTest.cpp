@@ -9,9 +9,12 @@ TEST(Json, IsWrittenOnOneLineInTheOrderOfItsMembers) {
     const Object object{
         {"z", Value{}}, {"a", true}, {"m", -5}, {"t", "\"\\\n\x7F"}, {"l", Array{1, "x", Array{}}},
         {"o", Object{}}};
-    EXPECT_EQ(toJson(object), R"({"z":null,"a":true,"m":-5,"t":"\"\\\n)"
-                              "\x7F"
-                              R"(","l":[1,"x",[]],"o":{}})");
+    EXPECT_EQ(toJson(object), R"({"z":null,"a":true,"m":-5,"t":"\"\\\n\u007f","l":[1,"x",[]],"o":{}})");
+}
+
+TEST(Json, HasNothingThatATerminalObeys) {
+    EXPECT_EQ(toJson(std::string("\x1B[0m\x7F\xC2\x80\xC2\x9B\xC2\xA0é€")),
+              "\"\\u001b[0m\\u007f\\u0080\\u009b\xC2\xA0é€\"");
 }
 
 TEST(Json, ReadsWhatItWrote) {
