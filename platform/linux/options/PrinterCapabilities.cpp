@@ -2,11 +2,13 @@
 
 #include <algorithm>
 #include <array>
+#include <cstring>
 #include <limits>
 #include <optional>
 #include <span>
 #include <string>
 #include <string_view>
+#include <type_traits>
 #include <vector>
 
 #include "platform/linux/options/CapabilityText.h"
@@ -143,6 +145,13 @@ bool isNumber(ipp_tag_t tag) {
     return tag == IPP_TAG_INTEGER || tag == IPP_TAG_ENUM;
 }
 
+// libcups hands out the byte of the message as it is, which need not be a value of the enumeration.
+bool isPerInch(const ipp_res_t& unit) {
+    std::underlying_type_t<ipp_res_t> number{};
+    std::memcpy(&number, &unit, sizeof number);
+    return number == IPP_RES_PER_INCH;
+}
+
 bool isTrayText(std::string_view text) {
     const auto isHarmless = [](char c) { return c >= ' ' && c <= '~' && c != '"' && c != '\\'; };
     return !text.empty() && text.size() <= 1023 && std::ranges::all_of(text, isHarmless);
@@ -251,7 +260,7 @@ void Copier::copyResolutions(ipp_attribute_t* from, const Row& row) const {
         ipp_res_t unit = IPP_RES_PER_INCH;
         const int x = ippGetResolution(from, i, &y, &unit);
         const auto isPlausible = [](int dots) { return dots > 0 && dots <= kFinestResolution; };
-        if (unit == IPP_RES_PER_INCH && isPlausible(x) && isPlausible(y)) {
+        if (isPerInch(unit) && isPlausible(x) && isPlausible(y)) {
             xs.push_back(x);
             ys.push_back(y);
         }
