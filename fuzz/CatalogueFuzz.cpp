@@ -1,11 +1,11 @@
 #include <cstddef>
 #include <cstdint>
-#include <cstdlib>
 #include <string_view>
 
 #include "catalogue/CatalogueBuilder.h"
 #include "catalogue/CatalogueFormat.h"
 #include "catalogue/DriverCatalogue.h"
+#include "fuzz/Require.h"
 
 // A catalogue file names packages that are going to be installed. What can be read keeps the rules of the
 // format, finds each package under its own tags, and is the same when it is written and read again.
@@ -13,11 +13,6 @@
 namespace {
 
 using namespace ventras;
-
-void require(bool holds) {
-    if (!holds)
-        std::abort();
-}
 
 void check(const DriverCatalogue& catalogue) {
     std::size_t tags = 0;

@@ -1,21 +1,18 @@
 #include <cstddef>
 #include <cstdint>
-#include <cstdlib>
 #include <string>
 #include <string_view>
 
 #include "deviceid/PMDictionaryAdditions.h"
 #include "deviceid/PMStringAdditions.h"
+#include "fuzz/Require.h"
 
 // A device ID is whatever a plugged-in device answers. Every operation is run on it, as text and as the
 // dictionary that it splits into, and the few things that hold for any bytes are checked.
 
 namespace {
 
-void require(bool holds) {
-    if (!holds)
-        std::abort();
-}
+using ventras::require;
 
 void readAsText(std::string_view deviceID) {
     using namespace ventras::PMStringAdditions;

@@ -1,16 +1,12 @@
-#include <sys/mman.h>
-#include <unistd.h>
-
-#include <array>
 #include <cstddef>
 #include <cstdint>
-#include <cstdlib>
 #include <string>
 
-#include "drivers/PPDKind.h"
-#include "drivers/PPDMatching.h"
 #include "drivers/PPDParser.h"
 #include "drivers/SoftwareUpdateDrivers.h"
+#include "fuzz/FileInMemory.h"
+#include "fuzz/RecordChecks.h"
+#include "fuzz/Require.h"
 #include "platform/PrintToolAgentChannel.h"
 #include "platform/Utf8.h"
 
@@ -22,30 +18,6 @@ namespace {
 
 using namespace ventras;
 
-void require(bool holds) {
-    if (!holds)
-        std::abort();
-}
-
-/// A file in memory that libcups can open by name.
-class MemoryFile {
-public:
-    MemoryFile() : descriptor_(memfd_create("ppd", MFD_CLOEXEC)) { require(descriptor_ >= 0); }
-    ~MemoryFile() { close(descriptor_); }
-    MemoryFile(const MemoryFile&) = delete;
-    MemoryFile& operator=(const MemoryFile&) = delete;
-
-    void hold(const std::uint8_t* data, std::size_t size) const {
-        require(ftruncate(descriptor_, 0) == 0);
-        require(pwrite(descriptor_, data, size, 0) == static_cast<ssize_t>(size));
-    }
-
-    std::string path() const { return "/proc/self/fd/" + std::to_string(descriptor_); }
-
-private:
-    int descriptor_;
-};
-
 /// Knows no driver for any device.
 class NoAgent final : public PrintToolAgentChannel {
 public:
@@ -56,22 +28,6 @@ public:
     }
 };
 
-void followRecord(const PPDRecord& record) {
-    require(record.make && record.makeAndModel && record.deviceID);
-    for (const auto& product : record.product)
-        require(isValidUtf8(product));
-    require(recordFromDictionary(dictionaryFromRecord(record)) == record);
-
-    const auto kind = PPDKind::of(record);
-    require(kind == PPDKind::kInstalledLocalized || kind == PPDKind::kInstalled || kind == PPDKind::kTioga);
-
-    // A device that says what a driver says is served by it.
-    for (const auto& product : record.product)
-        require(product.empty() || DeviceToMatch({}, {}, product).match(record));
-    const std::array list{record};
-    matchingDrivers(DeviceToMatch(record.deviceID, record.makeAndModel, record.make), list);
-}
-
 }  // namespace
 
 // libcups itself loses the earlier values of a keyword that is repeated, e.g. `LanguageEncoding`.
@@ -80,14 +36,14 @@ extern "C" const char* __lsan_default_suppressions() {
 }
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
-    static const MemoryFile file;
-    file.hold(data, size);
+    static const FileInMemory file;
+    file.hold({reinterpret_cast<const char*>(data), size});
     beginsAsPPD(file.path());
     const auto record = parsePPDFile(file.path());
     if (!record)
         return 0;
 
-    followRecord(*record);
+    checkRecord(*record);
     NoAgent agent;
     const PpdPtr ppd{ppdOpenFile(file.path().c_str())};
     require(!SoftwareUpdateDrivers::forPPD(agent, ppd.get()));

@@ -1,12 +1,12 @@
 #include <cstddef>
 #include <cstdint>
-#include <cstdlib>
 #include <string>
 #include <string_view>
 #include <variant>
 
 #include "catalogue/PackageSelection.h"
 #include "download/DownloadTriggerOperation.h"
+#include "fuzz/Require.h"
 #include "platform/TagPredicate.h"
 
 // Device IDs go into the text of a predicate as they stand. Whatever they hold, no predicate may select a
@@ -21,11 +21,6 @@ const DriverCatalogue& catalogue() {
         "debian 12", {{.name = "one", .tags = {"MANUFACTURER:A;MODEL:1"}},
                       {.name = "two", .tags = {"MANUFACTURER:B;MODEL:2", "printer update"}}});
     return kCatalogue;
-}
-
-void require(bool holds) {
-    if (!holds)
-        std::abort();
 }
 
 bool selectsAny(const std::string& predicate) {

@@ -1,10 +1,10 @@
 #include <cstddef>
 #include <cstdint>
-#include <cstdlib>
 #include <string>
 #include <string_view>
 
 #include "devices/TXTRecord.h"
+#include "fuzz/Require.h"
 #include "platform/Utf8.h"
 #include "platform/linux/options/LocalServiceResolver.h"
 
@@ -13,12 +13,9 @@
 
 namespace {
 
-constexpr std::size_t kLongestItem = 255;
+using ventras::require;
 
-void require(bool holds) {
-    if (!holds)
-        std::abort();
-}
+constexpr std::size_t kLongestItem = 255;
 
 void readAsDictionary(std::string_view record) {
     for (const auto& [key, value] : ventras::dictionaryFromTXTRecord(record)) {

@@ -3,10 +3,10 @@
 #include <cerrno>
 #include <cstddef>
 #include <cstdint>
-#include <cstdlib>
 #include <span>
 
 #include "devices/UsbInterfaceReader.h"
+#include "fuzz/Require.h"
 #include "tests/usb/FakeUsbRegistry.h"
 
 // A USB device that says anything at all: which interfaces it has, and how it answers each control request,
@@ -16,11 +16,6 @@
 namespace {
 
 using namespace ventras;
-
-void require(bool holds) {
-    if (!holds)
-        std::abort();
-}
 
 class Input {
 public:
