@@ -12,7 +12,7 @@ LinuxPlatform::LinuxPlatform()
       resources_(locateDataFolder()),
       strings_(locateDataFolder().parent_path() / "locale"),
       notifications_(log_),
-      installer_(log_),
+      installer_(log_, strings_),
       platform_{.runLoop = runLoop_,
                 .log = log_,
                 .authorization = authorization_,

@@ -11,7 +11,7 @@
 #include "platform/linux/desktop/DBusPrintToolAgentChannel.h"
 #include "platform/linux/desktop/LinuxComputerName.h"
 #include "platform/linux/desktop/PolkitAuthorization.h"
-#include "platform/linux/desktop/UnavailableInstallController.h"
+#include "platform/linux/installer/LinuxPredicateInstallController.h"
 #include "platform/linux/scheduler/CupsPrintSystem.h"
 #include "platform/linux/usb/LibusbRegistry.h"
 
@@ -40,7 +40,7 @@ private:
     GettextStringTable strings_;
     DBusNotificationBroadcast notifications_;
     DBusPrintToolAgentChannel printToolAgent_;
-    UnavailableInstallController installer_;
+    LinuxPredicateInstallController installer_;
     LibusbRegistry usb_;
     Platform platform_;
 };

@@ -11,6 +11,7 @@
 #include <thread>
 
 #include "platform/linux/FileDescriptor.h"
+#include "platform/linux/desktop/DBusCall.h"
 
 namespace ventras {
 namespace {
@@ -83,6 +84,21 @@ void PrivateBus::suspend() {
 
 void PrivateBus::resume() {
     daemon_.signal(SIGCONT);
+}
+
+void waitForService(const char* name, const RunningProgram& program) {
+    using namespace std::chrono_literals;
+    constexpr DBusMethod kHasOwner{Bus::System, "org.freedesktop.DBus", "/org/freedesktop/DBus",
+                                   "org.freedesktop.DBus", "NameHasOwner"};
+    for (int i = 0; i < 1000; ++i, std::this_thread::sleep_for(10ms)) {
+        const auto answer = callDBus(kHasOwner, g_variant_new("(s)", name), "(b)", 2s);
+        gboolean isThere = FALSE;
+        if (answer.reply)
+            g_variant_get(answer.reply.get(), "(b)", &isThere);
+        if (isThere != FALSE)
+            return;
+    }
+    throw std::runtime_error(std::string("no ") + name + ": " + program.standardError());
 }
 
 }  // namespace ventras

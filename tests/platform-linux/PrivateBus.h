@@ -36,4 +36,8 @@ private:
     RunningProgram daemon_;
 };
 
+/// Waits for a service to take its name on the system bus of the environment.
+/// @throw std::runtime_error, with what the program says, when it does not.
+void waitForService(const char* name, const RunningProgram& program);
+
 }  // namespace ventras

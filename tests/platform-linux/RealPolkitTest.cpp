@@ -3,10 +3,7 @@
 
 #include <chrono>
 #include <filesystem>
-#include <stdexcept>
-#include <thread>
 
-#include "platform/linux/desktop/DBusCall.h"
 #include "tests/parts/PrivateScheduler.h"
 #include "tests/parts/Program.h"
 #include "tests/parts/TemporaryFolder.h"
@@ -32,18 +29,7 @@ public:
                     "mount --bind \"$1/group\" /etc/group;"
                     "exec /usr/lib/polkit-1/polkitd --no-debug",
                     "sh", folder.path().string()}) {
-        constexpr DBusMethod kHasOwner{Bus::System, "org.freedesktop.DBus", "/org/freedesktop/DBus",
-                                       "org.freedesktop.DBus", "NameHasOwner"};
-        for (int i = 0; i < 500; ++i, std::this_thread::sleep_for(20ms)) {
-            const auto answer =
-                callDBus(kHasOwner, g_variant_new("(s)", "org.freedesktop.PolicyKit1"), "(b)", 2s);
-            gboolean isThere = FALSE;
-            if (answer.reply)
-                g_variant_get(answer.reply.get(), "(b)", &isThere);
-            if (isThere != FALSE)
-                return;
-        }
-        throw std::runtime_error("no polkitd: " + polkitd_.standardError());
+        waitForService("org.freedesktop.PolicyKit1", polkitd_);
     }
 
 private:

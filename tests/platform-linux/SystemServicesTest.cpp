@@ -6,14 +6,12 @@
 #include <thread>
 
 #include "platform/PropertyList.h"
-#include "platform/RunLoop.h"
 #include "platform/linux/DataFolder.h"
 #include "platform/linux/GettextStringTable.h"
 #include "platform/linux/LinuxPlatform.h"
 #include "platform/linux/PlistPreferenceStore.h"
 #include "platform/linux/ProcProcessTable.h"
 #include "platform/linux/Syslog.h"
-#include "platform/linux/desktop/UnavailableInstallController.h"
 #include "tests/fakes/FakePlatform.h"
 #include "tests/parts/Program.h"
 #include "tests/parts/TemporaryFolder.h"
@@ -93,6 +91,20 @@ TEST(ProcProcessTable, LooksAtProcessesOnly) {
     EXPECT_EQ(table.processNamed("other"), std::nullopt);
     EXPECT_EQ(table.processNamed("odd"), std::nullopt);
     EXPECT_EQ(table.processNamed(""), std::nullopt);
+}
+
+TEST(ProcProcessTable, DoesNotTrustThePlaceWhereAProcessWasFound) {
+    const TemporaryFolder folder;
+    folder.write("12/comm", "cupsd\n");
+    ProcProcessTable table(folder.path());
+    EXPECT_EQ(table.processNamed("cupsd"), 12);
+    folder.write("12/comm", "another\n");  // its number was given to somebody else
+    EXPECT_EQ(table.processNamed("cupsd"), std::nullopt);
+    folder.write("7/comm", "cupsd\n");  // it was started again
+    EXPECT_EQ(table.processNamed("cupsd"), 7);
+    std::filesystem::remove_all(folder / "7");
+    EXPECT_EQ(table.processNamed("cupsd"), std::nullopt);
+    EXPECT_EQ(table.processNamed("another"), 12);
 }
 
 TEST(ProcProcessTable, FindsNothingWithoutProcfs) {
@@ -243,42 +255,6 @@ TEST(UserConfigurationFolder, FollowsTheEnvironment) {
     EXPECT_TRUE(userConfigurationFolder().is_absolute());
     if (!home.empty())
         setenv("HOME", home.c_str(), 1);
-}
-
-class RecordingDelegate : public PredicateInstallDelegate {
-public:
-    std::vector<std::string> ends;
-    void predicateInstallDidComplete() override { ends.emplace_back("complete"); }
-    void predicateInstallUserDidCancel() override { ends.emplace_back("cancelled"); }
-    void predicateInstallDidFailWithError(std::int64_t code) override {
-        ends.push_back(std::to_string(code));
-    }
-};
-
-TEST(UnavailableInstallController, FailsFromTheRunLoop) {
-    RunLoop runLoop;
-    FakeLog log;
-    RecordingDelegate delegate;
-    UnavailableInstallController installer(log);
-    installer.setDelegate(&delegate);
-    installer.startWithPredicate("some predicate", true);
-    EXPECT_THAT(delegate.ends, IsEmpty());
-    runLoop.runUntil(Deadline::after(50ms));
-    EXPECT_THAT(delegate.ends, ElementsAre("69"));
-    EXPECT_THAT(log.lines(), ElementsAre(HasSubstr("some predicate")));
-}
-
-TEST(UnavailableInstallController, MayBeDestroyedBeforeItsFailureIsHeard) {
-    RunLoop runLoop;
-    FakeLog log;
-    RecordingDelegate delegate;
-    {
-        UnavailableInstallController installer(log);
-        installer.setDelegate(&delegate);
-        installer.startWithPredicate("some predicate", true);
-    }
-    runLoop.runUntil(Deadline::after(50ms));
-    EXPECT_THAT(delegate.ends, IsEmpty());
 }
 
 TEST(LinuxPlatform, BundlesAllServices) {
