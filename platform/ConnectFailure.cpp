@@ -1,14 +1,10 @@
 #include "platform/ConnectFailure.h"
 
-#include <netdb.h>
 #include <poll.h>
 #include <sys/socket.h>
-#include <sys/un.h>
 #include <unistd.h>
 
-#include <algorithm>
 #include <cerrno>
-#include <memory>
 #include <system_error>
 
 namespace ventras {
@@ -27,47 +23,26 @@ int errorOfPending(int socket) {
     return error;
 }
 
-int errorOfConnecting(const sockaddr* address, socklen_t length) {
-    const int descriptor = socket(address->sa_family, SOCK_STREAM | SOCK_CLOEXEC | SOCK_NONBLOCK, 0);
+int errorOfConnecting(const http_addr_t& address) {
+    const int descriptor = socket(address.addr.sa_family, SOCK_STREAM | SOCK_CLOEXEC | SOCK_NONBLOCK, 0);
     if (descriptor < 0)
         return errno;
-    int error = connect(descriptor, address, length) == 0 ? 0 : errno;
+    const auto length = static_cast<socklen_t>(httpAddrLength(&address));
+    int error = connect(descriptor, &address.addr, length) == 0 ? 0 : errno;
     if (error == EINPROGRESS)
         error = errorOfPending(descriptor);
     close(descriptor);
     return error;
 }
 
-std::string textOf(int error) {
-    return error == 0 ? "it does not speak TLS" : std::generic_category().message(error);
-}
-
-std::string socketFailure(const std::string& path) {
-    sockaddr_un address{};
-    address.sun_family = AF_UNIX;
-    if (path.size() >= sizeof address.sun_path)
-        return textOf(ENAMETOOLONG);
-    std::ranges::copy(path, address.sun_path);
-    return textOf(errorOfConnecting(reinterpret_cast<const sockaddr*>(&address), sizeof address));
-}
-
 }  // namespace
 
-std::string connectFailure(const std::string& host, int port) {
-    if (host.starts_with('/'))
-        return socketFailure(host);
-    addrinfo hints{};
-    hints.ai_socktype = SOCK_STREAM;
-    addrinfo* found = nullptr;
-    if (const int unknown = getaddrinfo(host.c_str(), std::to_string(port).c_str(), &hints, &found);
-        unknown != 0)
-        return gai_strerror(unknown);
-    const std::unique_ptr<addrinfo, decltype(&freeaddrinfo)> owner{found, &freeaddrinfo};
-    int error = 0;
-    for (const auto* address = found; address != nullptr; address = address->ai_next)
-        if (error = errorOfConnecting(address->ai_addr, address->ai_addrlen); error == 0)
+std::string connectFailure(const http_addrlist_t* addresses) {
+    int error = EDESTADDRREQ;
+    for (const auto* address = addresses; address != nullptr; address = address->next)
+        if (error = errorOfConnecting(address->addr); error == 0)
             break;
-    return textOf(error);
+    return error == 0 ? "it does not speak TLS" : std::generic_category().message(error);
 }
 
 }  // namespace ventras

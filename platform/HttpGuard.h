@@ -2,11 +2,7 @@
 
 #include <cups/cups.h>
 
-#include <condition_variable>
-#include <mutex>
-#include <stop_token>
-#include <thread>
-
+#include "platform/Alarm.h"
 #include "platform/Deadline.h"
 
 namespace ventras {
@@ -26,13 +22,9 @@ public:
     HttpGuard& operator=(const HttpGuard&) = delete;
 
 private:
-    void watch(const std::stop_token& stop);
-
     http_t* connection_;
     Deadline deadline_;
-    std::mutex mutex_;
-    std::condition_variable_any stopped_;
-    std::jthread watcher_;
+    Alarm alarm_;
 };
 
 }  // namespace ventras

@@ -1,17 +1,16 @@
 #include "platform/IppConnection.h"
 
-#include <sys/socket.h>
-#include <sys/stat.h>
-#include <unistd.h>
+#include <strings.h>
 
 #include <algorithm>
 #include <array>
 #include <atomic>
-#include <cerrno>
+#include <utility>
 
 #include "platform/ConnectFailure.h"
+#include "platform/HostAddresses.h"
 #include "platform/HttpGuard.h"
-#include "platform/ResponseBody.h"
+#include "platform/IppExchange.h"
 
 namespace ventras {
 namespace {
@@ -19,159 +18,90 @@ namespace {
 // The agent asks the scheduler several things, one after another and by many threads. One that hangs would
 // hold it for as many limits.
 std::atomic<bool> isSchedulerSilent = false;
+std::atomic<std::chrono::milliseconds> schedulerLimit = IppConnection::kSchedulerLimit;
+std::atomic<std::chrono::milliseconds> impatientLimit = IppConnection::kImpatientLimit;
 
-// libcups would ask on the terminal; an agent without windows has nobody to ask.
-const char* refusePassword(const char*, http_t*, const char*, const char*, void*) {
-    return nullptr;
+std::chrono::milliseconds limitFor(std::optional<std::chrono::milliseconds> wanted) {
+    const auto limit = wanted.value_or(schedulerLimit.load());
+    return isSchedulerSilent ? std::min(limit, impatientLimit.load()) : limit;
 }
 
 std::string seconds(std::chrono::milliseconds time) {
     return std::to_string(std::chrono::ceil<std::chrono::seconds>(time).count()) + " s";
 }
 
-// A challenge is answered once, an upgrade to TLS is followed once; whoever then still wants something else,
-// like a redirection to itself, would be asked for ever.
-constexpr int kMostAttempts = 3;
+// Requests that change nothing: asked twice, they do no harm.
+constexpr std::array kQuestions{IPP_OP_GET_PRINTER_ATTRIBUTES, IPP_OP_CUPS_GET_DEFAULT,
+                                IPP_OP_CUPS_GET_PRINTERS, IPP_OP_CUPS_GET_PPDS, IPP_OP_CUPS_GET_PPD};
 
-constexpr std::size_t kBlock = 65536;
-
-struct HttpRefusal {
-    http_status_t status;
-    ipp_status_t meaning;
-};
-
-constexpr std::array kHttpRefusals{
-    HttpRefusal{HTTP_STATUS_BAD_REQUEST, IPP_STATUS_ERROR_BAD_REQUEST},
-    HttpRefusal{HTTP_STATUS_UNAUTHORIZED, IPP_STATUS_ERROR_NOT_AUTHENTICATED},
-    HttpRefusal{HTTP_STATUS_FORBIDDEN, IPP_STATUS_ERROR_FORBIDDEN},
-    HttpRefusal{HTTP_STATUS_NOT_FOUND, IPP_STATUS_ERROR_NOT_FOUND},
-    HttpRefusal{HTTP_STATUS_REQUEST_TOO_LARGE, IPP_STATUS_ERROR_REQUEST_VALUE},
-    HttpRefusal{HTTP_STATUS_NOT_IMPLEMENTED, IPP_STATUS_ERROR_OPERATION_NOT_SUPPORTED},
-    HttpRefusal{HTTP_STATUS_NOT_SUPPORTED, IPP_STATUS_ERROR_VERSION_NOT_SUPPORTED},
-    HttpRefusal{HTTP_STATUS_UPGRADE_REQUIRED, IPP_STATUS_ERROR_CUPS_UPGRADE_REQUIRED},
-    HttpRefusal{HTTP_STATUS_SERVICE_UNAVAILABLE, IPP_STATUS_ERROR_SERVICE_UNAVAILABLE},
-};
-
-// Why there is no IPP answer: libcups' own texts are then left-overs of earlier system calls.
-IppAnswer unanswered(http_t* http, http_status_t status) {
-    if (status == HTTP_STATUS_CUPS_AUTHORIZATION_CANCELED)
-        return {nullptr, IPP_STATUS_ERROR_CUPS_AUTHENTICATION_CANCELED, "a password is asked for"};
-    if (status >= HTTP_STATUS_MULTIPLE_CHOICES) {
-        const auto row = std::ranges::find(kHttpRefusals, status, &HttpRefusal::status);
-        const auto meaning = row == kHttpRefusals.end() ? IPP_STATUS_ERROR_INTERNAL : row->meaning;
-        return {nullptr, meaning, "HTTP " + std::to_string(status) + " " + httpStatus(status)};
-    }
-    const int error = httpError(http);
-    const bool telling = error != 0 && error != EBADF;
-    return {nullptr, IPP_STATUS_ERROR_INTERNAL,
-            telling ? "no IPP answer: " + std::generic_category().message(error) : "no IPP answer"};
-}
-
-// 0 = chunked, for what is no regular file.
-std::size_t requestLength(ipp_t* request, int document) {
-    struct stat file {};
-    if (document < 0)
-        return ippLength(request);
-    if (fstat(document, &file) != 0 || !S_ISREG(file.st_mode))
-        return 0;
-    return ippLength(request) + static_cast<std::size_t>(file.st_size);
-}
-
-http_status_t sendDocument(http_t* http, int document) {
-    lseek(document, 0, SEEK_SET);
-    std::array<char, kBlock> block;
-    auto status = HTTP_STATUS_CONTINUE;
-    for (ssize_t length = 0;
-         status == HTTP_STATUS_CONTINUE && (length = read(document, block.data(), block.size())) > 0;)
-        status = cupsWriteRequestData(http, block.data(), static_cast<std::size_t>(length));
-    return status;
-}
-
-// What came of one attempt at an exchange.
-struct Attempt {
-    IppPtr response;
-    http_status_t status;
-};
-
-bool asksAgain(http_status_t status) {
-    return status == HTTP_STATUS_UNAUTHORIZED || status == HTTP_STATUS_UPGRADE_REQUIRED;
-}
-
-// Does what the peer wants before it carries the request out, so that a further attempt makes sense.
-http_status_t comply(http_t* http, http_status_t status, const std::string& resource) {
-    httpFlush(http);
-    if (status == HTTP_STATUS_UNAUTHORIZED && cupsDoAuthentication(http, "POST", resource.c_str()) != 0)
-        return HTTP_STATUS_CUPS_AUTHORIZATION_CANCELED;
-    if (asksAgain(status))
-        httpReconnect2(http, static_cast<int>(IppConnection::kConnectLimit.count()), nullptr);
-    if (status == HTTP_STATUS_UPGRADE_REQUIRED)
-        httpEncryption(http, HTTP_ENCRYPTION_REQUIRED);
-    return status;
-}
-
-http_status_t send(http_t* http, ipp_t* request, const std::string& resource, int document) {
-    const auto length = requestLength(request, document);
-    auto status = cupsSendRequest(http, request, resource.c_str(), length);
-    if (status == HTTP_STATUS_CONTINUE && document >= 0)
-        status = sendDocument(http, document);
-    if (status == HTTP_STATUS_CONTINUE && length == 0)
-        httpWrite2(http, "", 0);  // the last chunk
-    return status;
-}
-
-Attempt attempt(http_t* http, ipp_t* request, const std::string& resource, int document, ResponseBody& body) {
-    auto status = send(http, request, resource, document);
-    if (status > HTTP_STATUS_CONTINUE && status != HTTP_STATUS_OK)
-        return {nullptr, httpGetStatus(http)};
-    do
-        status = httpUpdate(http);
-    while (status == HTTP_STATUS_CONTINUE);
-    if (status == HTTP_STATUS_OK)
-        return {body.readMessage(), status};
-    return {nullptr, comply(http, status, resource)};
-}
-
-IppAnswer answered(IppPtr response) {
-    const auto status = ippGetStatusCode(response.get());
-    auto* attribute = ippFindAttribute(response.get(), "status-message", IPP_TAG_TEXT);
-    const char* message = attribute == nullptr ? nullptr : ippGetString(attribute, 0, nullptr);
-    return {std::move(response), status, message != nullptr ? message : ippErrorString(status)};
+bool isQuestion(ipp_t* request) {
+    return std::ranges::find(kQuestions, ippGetOperation(request)) != kQuestions.end();
 }
 
 }  // namespace
 
 IppConnection IppConnection::toPrinter(const std::string& host, int port, http_encryption_t encryption,
                                        std::chrono::milliseconds limit) {
-    return IppConnection{Peer::Printer, host, port, encryption, limit};
+    return IppConnection{Role::Printer, {host, port, encryption}, limit};
 }
 
-IppConnection IppConnection::toScheduler(std::chrono::milliseconds limit) {
-    return IppConnection{Peer::Scheduler, cupsServer(), ippPort(), cupsEncryption(),
-                         isSchedulerSilent ? std::min(limit, kImpatientLimit) : limit};
+IppConnection IppConnection::toScheduler(std::optional<std::chrono::milliseconds> limit) {
+    return IppConnection{Role::Scheduler, {cupsServer(), ippPort(), cupsEncryption()}, limitFor(limit)};
 }
 
-IppConnection::IppConnection(Peer peer, const std::string& host, int port, http_encryption_t encryption,
-                             std::chrono::milliseconds limit)
-    : peer_(peer), limit_(limit) {
-    constexpr int kConnectLater = 0;
-    http_.reset(httpConnect2(host.c_str(), port, nullptr, AF_UNSPEC, encryption, 1, kConnectLater, nullptr));
-    if (!http_) {
-        failure_ = connectFailure(host, port);
+void IppConnection::setSchedulerLimits(std::chrono::milliseconds limit, std::chrono::milliseconds impatient) {
+    schedulerLimit = limit;
+    impatientLimit = impatient;
+}
+
+IppConnection::IppConnection(Role role, Peer peer, std::chrono::milliseconds limit)
+    : role_(role),
+      peer_(std::move(peer)),
+      http_(IdleConnections::shared().take(peer_)),
+      isSecondHand_(http_ != nullptr),
+      isUsed_(isSecondHand_),
+      limit_(limit) {
+    if (!http_)
+        connect();
+}
+
+IppConnection::~IppConnection() {
+    if (mayBeKept())
+        IdleConnections::shared().keep(std::move(peer_), std::move(http_));
+}
+
+// A printer is asked twice and then let go: some serve one connection at a time, and the scheduler wants it
+// next.
+bool IppConnection::mayBeKept() const {
+    return http_ && isSound_ && (role_ == Role::Scheduler || !isSecondHand_) &&
+           httpGetState(http_.get()) == HTTP_STATE_WAITING &&
+           httpGetVersion(http_.get()) >= HTTP_VERSION_1_1 &&
+           strcasecmp(httpGetField(http_.get(), HTTP_FIELD_CONNECTION), "close") != 0;
+}
+
+void IppConnection::connect() {
+    const auto deadline = Deadline::after(kConnectLimit);
+    const auto addresses = HostAddresses::find(peer_.host, peer_.port, deadline);
+    if (!addresses.list) {
+        failure_ = addresses.failure;
         return;
     }
-
     // The handle comes first and the connection second, so that a TLS handshake is guarded too.
-    const auto deadline = Deadline::after(kConnectLimit);
-    int failed = 0;
-    {
-        const HttpGuard guard(http_.get(), deadline);
-        failed = httpReconnect2(http_.get(), static_cast<int>(kConnectLimit.count()), nullptr);
-    }
-    if (failed != 0) {
-        failure_ =
-            deadline.passed() ? "no connection within " + seconds(kConnectLimit) : connectFailure(host, port);
-        http_.reset();
-    }
+    constexpr int kConnectLater = 0;
+    http_.reset(httpConnect2(peer_.host.c_str(), peer_.port, addresses.list.get(), AF_UNSPEC,
+                             peer_.encryption, 1, kConnectLater, nullptr));
+    if (http_ && reconnect(deadline))
+        return;
+    failure_ = deadline.passed() ? "no connection within " + seconds(kConnectLimit)
+                                 : connectFailure(addresses.list.get());
+    http_.reset();
+}
+
+bool IppConnection::reconnect(Deadline deadline) {
+    const HttpGuard guard(http_.get(), deadline);
+    const auto left =
+        std::max(deadline.remaining(), std::chrono::milliseconds(1));  // libcups takes 0 for ever
+    return httpReconnect2(http_.get(), static_cast<int>(left.count()), nullptr) == 0;
 }
 
 IppAnswer IppConnection::exchange(IppPtr request, const std::string& resource, int document, int received) {
@@ -179,30 +109,32 @@ IppAnswer IppConnection::exchange(IppPtr request, const std::string& resource, i
         return {nullptr, IPP_STATUS_ERROR_SERVICE_UNAVAILABLE, failure_};
 
     const auto deadline = Deadline::after(limit_);
-    auto answer = exchangeBy(deadline, std::move(request), resource, document, received);
+    auto answer = exchangeBy(deadline, request.get(), resource, document, received);
     const bool isOverdue = !answer.succeeded() && deadline.passed();
-    if (peer_ == Peer::Scheduler)
+    isSound_ = answer.response && !isOverdue;
+    if (role_ == Role::Scheduler)
         isSchedulerSilent = isOverdue;
     if (isOverdue)
         return {nullptr, IPP_STATUS_ERROR_INTERNAL, "no complete answer within " + seconds(limit_)};
     return answer;
 }
 
-IppAnswer IppConnection::exchangeBy(Deadline deadline, IppPtr request, const std::string& resource,
+IppAnswer IppConnection::exchangeBy(Deadline deadline, ipp_t* request, const std::string& resource,
                                     int document, int received) {
-    cupsSetPasswordCB2(refusePassword, nullptr);
-    const HttpGuard guard(http_.get(), deadline);
-    ResponseBody body(http_.get());
-    Attempt last{nullptr, HTTP_STATUS_UNAUTHORIZED};
-    for (int i = 0; i < kMostAttempts && !last.response && asksAgain(last.status); ++i)
-        last = attempt(http_.get(), request.get(), resource, document, body);
+    const auto connecting = Deadline::after(std::min(kConnectLimit, deadline.remaining()));
+    const bool wasUsed = std::exchange(isUsed_, true);
+    if (wasUsed && hasEnded(http_.get()) && !reconnect(connecting))
+        return {nullptr, IPP_STATUS_ERROR_SERVICE_UNAVAILABLE, "it has hung up"};
 
-    auto answer = last.response ? answered(std::move(last.response)) : unanswered(http_.get(), last.status);
-    if (answer.response && received >= 0 && !body.copyDocument(received))
-        answer = {nullptr, IPP_STATUS_ERROR_INTERNAL, "the document that came back is incomplete"};
-    if (httpGetState(http_.get()) != HTTP_STATE_WAITING)
-        httpFlush(http_.get());
-    return answer;
+    const auto attempt = [&] {
+        const HttpGuard guard(http_.get(), deadline);
+        return exchangeOver(http_.get(), request, resource, document, received);
+    };
+    auto [answer, heardNothing] = attempt();
+    // The peer may have hung up just when the request was on its way.
+    if (heardNothing && wasUsed && isQuestion(request) && !deadline.passed() && reconnect(connecting))
+        return attempt().answer;
+    return std::move(answer);
 }
 
 }  // namespace ventras

@@ -6,29 +6,26 @@
 
 #include "platform/Deadline.h"
 #include "platform/Handles.h"
+#include "platform/IdleConnections.h"
+#include "platform/IppAnswer.h"
 
 namespace ventras {
 
-/// What came of one IPP request.
-struct IppAnswer {
-    IppPtr response;      ///< empty when no IPP answer arrived
-    ipp_status_t status;  ///< libcups' verdict on the whole exchange (RFC 8011 appendix B)
-    std::string reason;   ///< one line for people: why `status` is no success
-
-    /// A successful-ok status; only this says that the request was carried out, a response alone does not.
-    bool succeeded() const { return status <= IPP_STATUS_OK_EVENTS_COMPLETE; }
-};
-
 /// One HTTP connection for IPP requests (RFC 8010), bounded in time.
 ///
-/// Nobody is ever asked for a password: a peer that demands one is a failed exchange. Use it on one thread.
+/// The TCP connection behind it may be one that an earlier object left, and is left to later ones: a
+/// scheduler is asked many things, and a printer two. A peer that has hung up meanwhile is connected to
+/// again. Nobody is ever asked for a password: a peer that demands one is a failed exchange. Use it on one
+/// thread.
 class IppConnection {
 public:
-    /// Longest time for reaching a printer, TLS handshake included.
+    /// Longest time for reaching a peer, the lookup of its name and the TLS handshake included.
     static constexpr std::chrono::milliseconds kConnectLimit = std::chrono::seconds(10);
     /// Longest time for one whole exchange with a printer, and with the scheduler.
     static constexpr std::chrono::milliseconds kPrinterLimit = std::chrono::seconds(30);
     static constexpr std::chrono::milliseconds kSchedulerLimit = std::chrono::seconds(120);
+    /// The same with a scheduler that has just kept somebody in this process waiting for a whole limit, until
+    /// it gives an answer again.
     static constexpr std::chrono::milliseconds kImpatientLimit = std::chrono::seconds(5);
 
     /// Connects to any address of `host`, an IPv6 literal without brackets included.
@@ -37,9 +34,16 @@ public:
     static IppConnection toPrinter(const std::string& host, int port, http_encryption_t encryption,
                                    std::chrono::milliseconds limit = kPrinterLimit);
 
-    /// Connects to the scheduler of the user's libcups configuration. A scheduler that has just kept somebody
-    /// in this process waiting for a whole limit has kImpatientLimit for an answer, until it gives one again.
-    static IppConnection toScheduler(std::chrono::milliseconds limit = kSchedulerLimit);
+    /// Connects to the scheduler of the user's libcups configuration.
+    /// @param limit for each exchange later on, as long as the scheduler answers; absent = kSchedulerLimit
+    static IppConnection toScheduler(std::optional<std::chrono::milliseconds> limit = std::nullopt);
+
+    /// Replaces kSchedulerLimit and kImpatientLimit in this process. Any thread may call.
+    static void setSchedulerLimits(std::chrono::milliseconds limit, std::chrono::milliseconds impatientLimit);
+
+    IppConnection(IppConnection&&) = default;
+    IppConnection& operator=(IppConnection&&) = delete;
+    ~IppConnection();
 
     /// Whether the peer was reached.
     bool connected() const { return http_ != nullptr; }
@@ -56,15 +60,21 @@ public:
     IppAnswer exchange(IppPtr request, const std::string& resource, int document = -1, int received = -1);
 
 private:
-    enum class Peer { Printer, Scheduler };
+    enum class Role { Printer, Scheduler };
 
-    IppConnection(Peer peer, const std::string& host, int port, http_encryption_t encryption,
-                  std::chrono::milliseconds limit);
-    IppAnswer exchangeBy(Deadline deadline, IppPtr request, const std::string& resource, int document,
+    IppConnection(Role role, Peer peer, std::chrono::milliseconds limit);
+    void connect();
+    bool reconnect(Deadline deadline);
+    IppAnswer exchangeBy(Deadline deadline, ipp_t* request, const std::string& resource, int document,
                          int received);
+    bool mayBeKept() const;
 
+    Role role_;
     Peer peer_;
     HttpPtr http_;
+    bool isSecondHand_ = false;  ///< another object used the connection before
+    bool isUsed_ = false;        ///< somebody did
+    bool isSound_ = false;       ///< the last exchange brought an answer
     std::string failure_;
     std::chrono::milliseconds limit_;
 };

@@ -5,21 +5,11 @@
 #include <sys/socket.h>
 #include <unistd.h>
 
-#include <array>
+#include <list>
 #include <utility>
+#include <vector>
 
 namespace ventras {
-namespace {
-
-/// Waits until the socket has something to say. @return false when the scheduler is to stop instead.
-bool waitFor(int socket, int stop) {
-    std::array descriptors{pollfd{socket, POLLIN, 0}, pollfd{stop, POLLIN, 0}};
-    poll(descriptors.data(), descriptors.size(), -1);
-    return descriptors[1].revents == 0;
-}
-
-}  // namespace
-
 ScriptedScheduler::ScriptedScheduler(Answer answer)
     : answer_(std::move(answer)), stop_(eventfd(0, EFD_CLOEXEC)), thread_([this] { serve(); }) {}
 
@@ -35,16 +25,26 @@ std::vector<HttpMessage> ScriptedScheduler::requests() const {
 }
 
 void ScriptedScheduler::serve() {
-    while (waitFor(listener_.descriptor(), stop_))
-        if (const int socket = accept4(listener_.descriptor(), nullptr, nullptr, SOCK_CLOEXEC); socket >= 0)
-            converse(socket);
-}
+    std::list<ScriptedConnection> connections;
+    for (;;) {
+        std::vector<pollfd> descriptors{{stop_, POLLIN, 0}, {listener_.descriptor(), POLLIN, 0}};
+        for (const auto& connection : connections)
+            descriptors.push_back({connection.socket(), POLLIN, 0});
+        poll(descriptors.data(), descriptors.size(), -1);
+        if (descriptors[0].revents != 0)
+            return;
 
-void ScriptedScheduler::converse(int socket) {
-    ScriptedConnection connection(socket, [this](const HttpMessage& message) { return reply(message); });
-    while (!connection.isOver() && waitFor(connection.socket(), stop_)) {
-        connection.onReadable();
-        connection.advance();
+        auto descriptor = descriptors.begin() + 2;
+        for (auto& connection : connections)
+            if ((descriptor++)->revents != 0) {
+                connection.onReadable();
+                connection.advance();
+            }
+        connections.remove_if([](const auto& connection) { return connection.isOver(); });
+        if (descriptors[1].revents == 0)
+            continue;
+        if (const int socket = accept4(listener_.descriptor(), nullptr, nullptr, SOCK_CLOEXEC); socket >= 0)
+            connections.emplace_back(socket, [this](const HttpMessage& message) { return reply(message); });
     }
 }
 

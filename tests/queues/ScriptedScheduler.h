@@ -13,7 +13,7 @@
 namespace ventras {
 
 /// A print scheduler of our own on loopback that says whatever a test needs, where the real one would never
-/// say it. One connection at a time; any thread may ask for what it was sent.
+/// say it. Any thread may ask for what it was sent.
 class ScriptedScheduler {
 public:
     /// Fills in the answer to each request, on the scheduler's thread.
@@ -32,7 +32,6 @@ public:
 
 private:
     void serve();
-    void converse(int socket);
     ScriptedReply reply(const HttpMessage& message);
 
     Answer answer_;

@@ -1,0 +1,34 @@
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <span>
+
+namespace ventras {
+
+/// Watches how deep the collections of an IPP message nest (RFC 8010 section 3.1) while its bytes go by.
+/// libcups calls itself for each level, and has no limit but the end of the stack. One thread at a time.
+class CollectionNesting {
+public:
+    /// Deeper than the collections of any printer, which are media in lists, and sizes within media.
+    static constexpr int kDeepest = 16;
+
+    /// Takes the next bytes of the message; those behind its end do not count.
+    /// @return false when collections nest too deep or end without a beginning, or when there is a tag that
+    /// nobody uses and that readers understand differently.
+    bool follow(std::span<const std::uint8_t> bytes);
+
+private:
+    enum class Field { Header, Tag, NameLength, Name, ValueLength, Value, End };
+
+    bool finishField();
+    bool take(std::uint32_t tag);
+    bool expect(Field field, std::size_t length);
+
+    Field field_ = Field::Header;
+    std::size_t missing_ = 8;  // bytes of the field
+    std::uint32_t number_ = 0;
+    int depth_ = 0;
+};
+
+}  // namespace ventras

@@ -1,0 +1,83 @@
+#include "platform/CollectionNesting.h"
+
+#include <gtest/gtest.h>
+
+#include <string>
+
+#include "tests/parts/ScriptedReply.h"
+
+namespace ventras {
+namespace {
+
+using namespace std::string_literals;
+
+const std::string kHeader = "\2\0\0\0\0\0\0\1\4"s;
+const std::string kBegin = "\x34\0\0\0\0"s;
+const std::string kEnd = "\x37\0\0\0\0"s;
+const std::string kMember = "\x4a\0\0\0\1m"s;
+const std::string kEndOfMessage = "\3"s;
+
+std::string repeated(const std::string& text, int count) {
+    std::string all;
+    for (int i = 0; i < count; ++i)
+        all += text;
+    return all;
+}
+
+std::string nested(int depth) {
+    return kBegin + repeated(kMember + kBegin, depth - 1) + repeated(kEnd, depth);
+}
+
+bool passes(const std::string& bytes, std::size_t atOnce = std::string::npos) {
+    CollectionNesting nesting;
+    for (std::size_t at = 0; at < bytes.size(); at += std::min(atOnce, bytes.size())) {
+        const auto part = bytes.substr(at, atOnce);
+        if (!nesting.follow({reinterpret_cast<const std::uint8_t*>(part.data()), part.size()}))
+            return false;
+    }
+    return true;
+}
+
+TEST(CollectionNesting, IsNoneInAMessageWithoutCollections) {
+    EXPECT_TRUE(passes(kHeader + rawAttribute(IPP_TAG_NAME, "printer-name", "4444") + kEndOfMessage));
+}
+
+TEST(CollectionNesting, MayBeSixteenDeep) {
+    EXPECT_TRUE(passes(kHeader + nested(16) + kEndOfMessage));
+    EXPECT_FALSE(passes(kHeader + nested(17) + kEndOfMessage));
+    EXPECT_FALSE(passes(kHeader + nested(100'000) + kEndOfMessage));
+}
+
+TEST(CollectionNesting, IsSeenHoweverTheBytesArrive) {
+    for (const std::size_t atOnce : {1U, 2U, 3U, 7U, 64U}) {
+        EXPECT_TRUE(passes(kHeader + nested(16) + kEndOfMessage, atOnce)) << atOnce;
+        EXPECT_FALSE(passes(kHeader + nested(17) + kEndOfMessage, atOnce)) << atOnce;
+    }
+}
+
+TEST(CollectionNesting, DoesNotGrowWithCollectionsSideBySide) {
+    EXPECT_TRUE(passes(kHeader + repeated(nested(2), 1000) + kEndOfMessage));
+}
+
+TEST(CollectionNesting, IsNotToldByBytesInNamesAndValues) {
+    const auto names = rawAttribute(IPP_TAG_NAME, "4", "4") + rawAttribute(IPP_TAG_NAME, "7", "7");
+    EXPECT_TRUE(passes(kHeader + repeated(names, 100) + kEndOfMessage));
+    EXPECT_FALSE(
+        passes(kHeader + repeated(kBegin + rawAttribute(IPP_TAG_NAME, "7", "7"), 17) + kEndOfMessage));
+}
+
+TEST(CollectionNesting, EndsWithTheMessage) {
+    EXPECT_TRUE(passes(kHeader + kEndOfMessage + repeated(kBegin, 100)));
+}
+
+TEST(CollectionNesting, DoesNotEndBeforeItBegins) {
+    EXPECT_FALSE(passes(kHeader + kEnd + kEndOfMessage));
+}
+
+// RFC 8010 and libcups read the bytes behind it differently.
+TEST(CollectionNesting, AllowsNoExtensionTag) {
+    EXPECT_FALSE(passes(kHeader + rawAttribute(IPP_TAG_EXTENSION, "x", "\0\0\0\x34"s) + kEndOfMessage));
+}
+
+}  // namespace
+}  // namespace ventras
