@@ -5,6 +5,8 @@
 #include <optional>
 #include <string>
 #include <string_view>
+#include <thread>
+#include <utility>
 
 #include "platform/IppConnection.h"
 
@@ -95,6 +97,12 @@ private:
     std::vector<PPDRecord> records_;
 };
 
+// libcups keeps each text once, and to free one it searches thousands: that takes as long as reading them
+// did. Nobody need wait for it.
+void freeAside(IppPtr response) {
+    std::thread([unused = std::move(response)] {}).detach();
+}
+
 }  // namespace
 
 std::vector<PPDRecord> ask() {
@@ -103,10 +111,12 @@ std::vector<PPDRecord> ask() {
     ippAddStrings(request.get(), IPP_TAG_OPERATION, IPP_TAG_NAME, "include-schemes", kSchemes.size(), nullptr,
                   kSchemes.data());
 
-    const auto answer = IppConnection::toScheduler().exchange(std::move(request), "/");
+    auto answer = IppConnection::toScheduler().exchange(std::move(request), "/");
     if (!answer.succeeded() || !answer.response)
         return {};
-    return recordsIn(answer.response.get());
+    auto records = recordsIn(answer.response.get());
+    freeAside(std::move(answer.response));
+    return records;
 }
 
 std::vector<PPDRecord> recordsIn(ipp_t* response) {

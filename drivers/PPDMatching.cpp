@@ -35,7 +35,7 @@ constexpr bool endsWord(char c) {
 /// Words that are found as they stand: ASCII ones, but not the "HP" that may have replaced the maker's full
 /// name.
 bool isTelling(std::string_view word) {
-    return !TextScan::equalsIgnoringCase(word, "hp") &&
+    return !word.empty() && !TextScan::equalsIgnoringCase(word, "hp") &&
            std::ranges::all_of(word, [](char c) { return static_cast<unsigned char>(c) < 0x80; });
 }
 
@@ -48,24 +48,23 @@ Telltale telltaleOf(std::string_view text) {
     Telltale telltale;
     for (auto begin = text.begin(); begin != text.end();) {
         const auto end = std::find_if(begin, text.end(), endsWord);
-        const std::string_view word(begin, end);
-        if (isTelling(word)) {
-            if (word.size() > telltale.word.size())
-                telltale.word = word;
+        if (const std::string_view word(begin, end); isTelling(word)) {
+            telltale.words.emplace_back(word);
             if (end == text.end())
-                telltale.lastWord = word;
+                telltale.lastWord = telltale.words.back();
         }
         begin = end == text.end() ? end : std::next(end);
     }
+    std::stable_partition(telltale.words.begin(), telltale.words.end(),
+                          [](const SoughtWord& word) { return word.isRare(); });
     return telltale;
 }
 
 /// Whether the word occurs close before the end of a value: only the last character of a product, a
 /// parenthesis as a rule, may stand between.
-bool endsAValue(std::string_view deviceID, std::string_view word) {
+bool endsAValue(std::string_view deviceID, const SoughtWord& word) {
     constexpr std::size_t kLongestCharacter = 4;
-    for (auto at = TextScan::findIgnoringCase(deviceID, word); at != std::string_view::npos;
-         at = TextScan::findIgnoringCase(deviceID, word)) {
+    for (auto at = word.findIn(deviceID); at != std::string_view::npos; at = word.findIn(deviceID)) {
         deviceID.remove_prefix(at + word.size());
         if (deviceID.size() <= kLongestCharacter || deviceID.find(';') <= kLongestCharacter)
             return true;
@@ -75,12 +74,19 @@ bool endsAValue(std::string_view deviceID, std::string_view word) {
 
 std::vector<Telltale> telltalesOf(const FoldedTexts& texts) {
     std::vector<Telltale> telltales;
-    for (const auto& text : texts.all()) {
-        auto telltale = telltaleOf(text);
-        if (std::ranges::find(telltales, telltale) == telltales.end())
-            telltales.push_back(std::move(telltale));
-    }
+    for (const auto& text : texts.all())
+        telltales.push_back(telltaleOf(text));
     return telltales;
+}
+
+/// Most records are turned away faster than the processor gets hold of their texts, which lie anywhere in
+/// memory: it is told a few records ahead.
+void fetchTexts(const PPDRecord& record) {
+    if (!record.product.empty())
+        __builtin_prefetch(record.product.data());
+    for (const auto* text : {&record.deviceID, &record.name, &record.makeAndModel})
+        if (*text)
+            __builtin_prefetch((*text)->data());
 }
 
 /// Sorts those matches of one kind that have a driver name among the places that they hold; the others, which
@@ -188,18 +194,24 @@ std::optional<MatchReason> DeviceToMatch::matchName(const PPDRecord& record) con
 }
 
 bool DeviceToMatch::mayOccurIn(std::string_view deviceID) const {
-    return std::ranges::any_of(telltales_, [&](const auto& telltale) {
-        const auto& [word, lastWord] = telltale;
-        return (word.empty() || TextScan::findIgnoringCase(deviceID, word) != std::string_view::npos) &&
-               (lastWord.empty() || endsAValue(deviceID, lastWord));
+    const auto occurs = [deviceID](const SoughtWord& word) {
+        return word.findIn(deviceID) != std::string_view::npos;
+    };
+    return std::ranges::any_of(telltales_, [&](const Telltale& telltale) {
+        return std::ranges::all_of(telltale.words, occurs) &&
+               (!telltale.lastWord || endsAValue(deviceID, *telltale.lastWord));
     });
 }
 
 std::vector<PPDMatch> matchingDrivers(const DeviceToMatch& device, std::span<const PPDRecord> list) {
+    constexpr std::size_t kAhead = 6;
     std::vector<PPDMatch> matches;
-    for (std::size_t i = 0; i < list.size(); ++i)
+    for (std::size_t i = 0; i < list.size(); ++i) {
+        if (i + kAhead < list.size())
+            fetchTexts(list[i + kAhead]);
         if (const auto reason = device.match(list[i]))
             matches.push_back({i, PPDKind::of(list[i]), *reason});
+    }
     sortByDriverOrder(matches, list);
     return matches;
 }

@@ -10,6 +10,7 @@
 #include "drivers/FoldedText.h"
 #include "drivers/PPDKind.h"
 #include "drivers/PPDRecord.h"
+#include "drivers/SoughtWord.h"
 
 namespace ventras {
 
@@ -27,12 +28,10 @@ enum class MatchReason {
 /// The reason in a few words for people.
 std::string_view describe(MatchReason reason);
 
-/// Words without which a device ID cannot say the same as some text; an empty one is always there.
+/// Words without which a device ID cannot say the same as some text.
 struct Telltale {
-    std::string word;      ///< somewhere
-    std::string lastWord;  ///< at the end of a value
-
-    bool operator==(const Telltale&) const = default;
+    std::vector<SoughtWord> words;       ///< somewhere, the rarest first
+    std::optional<SoughtWord> lastWord;  ///< at the end of a value
 };
 
 /// What a device says of itself, prepared once for being compared with every driver of a catalogue.

@@ -24,6 +24,12 @@ constexpr std::array kEncodings{
     Encoding{TextEncoding::ShiftJIS, "JIS83-RKSJ", "CP932"},
 };
 
+// What all the encodings have in common. The two others are something else in some tables of Shift JIS.
+constexpr bool isPlainAscii(char c) {
+    const auto byte = static_cast<unsigned char>(c);
+    return byte != 0 && byte < 0x80 && c != '\\' && c != '~';
+}
+
 }  // namespace
 
 TextEncoding textEncodingNamed(std::string_view languageEncoding) {
@@ -35,6 +41,9 @@ std::optional<std::string> decoded(std::string_view bytes, TextEncoding encoding
     const auto* entry = std::ranges::find(kEncodings, encoding, &Encoding::encoding);
     if (entry == kEncodings.end())
         return isValidUtf8(bytes) ? std::optional<std::string>(bytes) : std::nullopt;
+    // A converter is a library of its own, which takes longer to load than a whole PPD takes to read.
+    if (std::ranges::all_of(bytes, isPlainAscii))
+        return std::string(bytes);
 
     gsize written = 0;
     const std::unique_ptr<gchar, decltype(&g_free)> text{
