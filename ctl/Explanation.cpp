@@ -11,6 +11,7 @@
 #include "ctl/Text.h"
 #include "devices/VentrasPrinterObject.h"
 #include "platform/PropertyList.h"
+#include "platform/QueueAttributes.h"
 #include "queues/QueueInventory.h"
 #include "queues/QueueMaker.h"
 
@@ -49,7 +50,7 @@ Value reasonFor(const std::string& queueID, VentrasPrinterObject& device, const 
 
 Object objectOf(const PlannedQueue& queue) {
     const auto attributes = parsePropertyList(queue.attributes);
-    const auto displayName = queue.options.find("PC WSItem User Name");
+    const auto displayName = queue.options.find(std::string(QueueOptionKeys::kDisplayName));
     return {{"queueID", queue.queueID},
             {"displayName", displayName == queue.options.end() ? Value{} : Value{displayName->second}},
             {"attributes", attributes ? valueOf(*attributes) : Value{}}};

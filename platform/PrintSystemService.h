@@ -71,7 +71,7 @@ public:
     /// @param serverURL from copyLocalServerURL()
     /// @param queueID from suggestQueueName()
     /// @param attributes QueueAttributes as an XML property list
-    /// @param options "PC WSItem User Name" = the queue's name for people
+    /// @param options by QueueOptionKeys
     /// @return 0, or a PrintSystemStatus; the reason is in the system log.
     virtual std::int32_t createQueue(const std::string& serverURL, const std::string& queueID,
                                      const std::string& attributes,

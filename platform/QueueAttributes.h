@@ -22,4 +22,9 @@ inline constexpr std::string_view kScanner = "Scanner";  ///< boolean true, for 
 inline constexpr std::string_view kLocation = "Location";
 }  // namespace QueueAttributeKeys
 
+/// Keys of the options that go to the print system beside a QueueAttributes dictionary.
+namespace QueueOptionKeys {
+inline constexpr std::string_view kDisplayName = "PC WSItem User Name";  ///< the queue's name for people
+}  // namespace QueueOptionKeys
+
 }  // namespace ventras

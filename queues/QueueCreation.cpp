@@ -96,8 +96,8 @@ QueueCreationResult QueueCreation::createUnderLock(const QueueAttributes& attrib
     if (!queueID)
         return {QueueStatus::kNoIdentifier, std::nullopt};
 
-    const auto status =
-        printSystem.createQueue(*server, *queueID, *serialized, {{"PC WSItem User Name", displayName}});
+    const auto status = printSystem.createQueue(*server, *queueID, *serialized,
+                                                {{std::string(QueueOptionKeys::kDisplayName), displayName}});
     if (status != 0) {
         printSystem.removeQueue(*queueID);
         return {status, std::nullopt};

@@ -17,7 +17,6 @@ namespace {
 using namespace std::string_view_literals;
 
 constexpr std::size_t kLongestURI = 1023;  // RFC 8011 section 5.1.6
-constexpr auto kDisplayNameOption = "PC WSItem User Name";
 constexpr auto kNoDevice = "file:///dev/null"sv;
 
 struct SchemeRow {
@@ -92,7 +91,7 @@ std::variant<NewQueue, Refusal> NewQueue::parse(const std::string& queueID, cons
     queue.deviceURI = textUnder(*dictionary, QueueAttributeKeys::kPrinterURI);
     queue.ppdPath = textUnder(*dictionary, QueueAttributeKeys::kPPD);
     queue.location = textUnder(*dictionary, QueueAttributeKeys::kLocation);
-    if (const auto name = options.find(kDisplayNameOption); name != options.end())
+    if (const auto name = options.find(std::string(QueueOptionKeys::kDisplayName)); name != options.end())
         queue.displayName = name->second;
     if (auto refusal = objectionTo(queue))
         return *refusal;

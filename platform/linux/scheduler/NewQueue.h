@@ -20,7 +20,7 @@ struct NewQueue {
 
     /// Reads the settings.
     /// @param attributes QueueAttributes as an XML property list
-    /// @param options "PC WSItem User Name" = the name for people
+    /// @param options by QueueOptionKeys
     static std::variant<NewQueue, Refusal> parse(const std::string& queueID, const std::string& attributes,
                                                  const std::map<std::string, std::string>& options);
 };
