@@ -4,6 +4,7 @@
 #include <dlfcn.h>
 
 #include <array>
+#include <atomic>
 #include <fstream>
 #include <iterator>
 #include <mutex>
@@ -65,8 +66,10 @@ bool correct(const std::string& path, PrinterService service) {
 
 }  // namespace
 
-void loadPPDGenerator() {
-    loadedGenerator();
+std::jthread loadPPDGenerator() {
+    static std::atomic<bool> begun = false;
+    // Nothing comes of an empty description; but the first call reads all the texts that PPDs are made with.
+    return begun.exchange(true) ? std::jthread() : std::jthread([] { generate(IppPtr{ippNew()}.get()); });
 }
 
 std::variant<TemporaryFile, std::string> driverlessPPD(ipp_t* capabilities, PrinterService service) {

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <string>
+#include <thread>
 #include <variant>
 
 #include "platform/Handles.h"
@@ -9,9 +10,11 @@
 
 namespace ventras {
 
-/// Loads what driverlessPPD() needs, which takes a while, so that it can happen while a printer is being
-/// waited for. Any thread may call, any number of times.
-void loadPPDGenerator();
+/// Begins to load what driverlessPPD() needs, which takes a while, so that it can happen while printers are
+/// being waited for. No thread can be started meanwhile: the loader's lock is in the way. Any thread may
+/// call, any number of times.
+/// @return the thread that does it; none when that has been begun before.
+std::jthread loadPPDGenerator();
 
 /// Makes the PPD of one IPP printer with the field's own generator, and checks what comes out. Any thread may
 /// call; the generator works for one at a time.

@@ -1,7 +1,6 @@
 #include "platform/linux/options/IppOptionSelection.h"
 
 #include <array>
-#include <thread>
 #include <variant>
 
 #include "platform/IppConnection.h"
@@ -35,7 +34,7 @@ Outcome makePPD(const std::string& deviceURI, PrinterService service) {
     const auto address = PrinterAddress::find(deviceURI, service);
     if (!address)
         return "it has no address";
-    const std::jthread loader(loadPPDGenerator);  // while the printer thinks
+    const auto loader = loadPPDGenerator();  // while the printer thinks
     const auto answer = askForDescription(*address);
     if (!answer.succeeded())
         return "it does not describe itself: " + answer.reason;
