@@ -1,7 +1,6 @@
 // Finding the drivers of one device in a catalogue of 20,000, against the same rules written plainly.
 
 #include <array>
-#include <chrono>
 #include <cstdio>
 #include <optional>
 #include <string>
@@ -10,6 +9,7 @@
 #include "bench/AllocationCount.h"
 #include "bench/NaiveMatching.h"
 #include "bench/SpeedTable.h"
+#include "bench/Stopwatch.h"
 #include "bench/SyntheticCatalogue.h"
 #include "drivers/PPDMatching.h"
 
@@ -39,9 +39,9 @@ std::vector<Device> devices(const std::vector<PPDRecord>& catalogue) {
 
 template <typename Work>
 double milliseconds(Work work) {
-    const auto start = std::chrono::steady_clock::now();
+    const Stopwatch stopwatch;
     work();
-    return std::chrono::duration<double, std::milli>(std::chrono::steady_clock::now() - start).count();
+    return stopwatch.milliseconds();
 }
 
 std::vector<std::size_t> fast(const Device& device, const std::vector<PPDRecord>& catalogue) {

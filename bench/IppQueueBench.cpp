@@ -11,6 +11,7 @@
 #include <vector>
 
 #include "bench/SpeedTable.h"
+#include "bench/Stopwatch.h"
 #include "bench/TimedProgram.h"
 #include "tests/parts/PrivateScheduler.h"
 #include "tests/parts/ScriptedPrinter.h"
@@ -38,10 +39,6 @@ Printers scriptedPrinters(std::size_t count, std::chrono::milliseconds delay) {
         printers.push_back(std::make_unique<ScriptedPrinter>(
             ScriptedPrinterOptions{.name = "Printer " + std::to_string(i), .delay = delay}));
     return printers;
-}
-
-double millisecondsSince(std::chrono::steady_clock::time_point start) {
-    return std::chrono::duration<double, std::milli>(std::chrono::steady_clock::now() - start).count();
 }
 
 Strings uris(const Printers& printers) {
@@ -113,14 +110,14 @@ public:
                         std::make_unique<ScriptedPrinter>(ScriptedPrinterOptions{.fault = Fault::silent}));
         Strings command = uris(printers);
         command.insert(command.begin(), VENTRAS_AGENT);
-        const auto start = std::chrono::steady_clock::now();
+        const Stopwatch stopwatch;
         RunningProgram run(command);
         while (scheduler_.queues().size() < kManyPrinters - 1) {
-            if (std::chrono::steady_clock::now() - start > 60s)
+            if (stopwatch.milliseconds() > 60'000)
                 throw std::runtime_error("one silent printer keeps the queues of the others from being made");
             std::this_thread::sleep_for(5ms);
         }
-        const auto elapsed = millisecondsSince(start);
+        const auto elapsed = stopwatch.milliseconds();
         run.end();
         table.atMost("49 such printers and a silent one: until the 49 queues are there", elapsed, 2000, "ms");
         deleteQueues();
@@ -138,12 +135,12 @@ private:
         LpadminTimes sum;
         for (std::size_t i = 0; i < printers.size(); ++i) {
             const auto queue = "P" + std::to_string(i);
-            const auto start = std::chrono::steady_clock::now();
+            const Stopwatch stopwatch;
             sum.returned +=
                 timedRun({"lpadmin", "-p", queue, "-E", "-v", printers[i], "-m", "everywhere"}).milliseconds;
             if (!PrivateScheduler::appears(scheduler_.folder() / "etc/ppd" / (queue + ".ppd")))
                 throw std::runtime_error("lpadmin made no driver for " + queue);
-            sum.usable += millisecondsSince(start);
+            sum.usable += stopwatch.milliseconds();
             std::this_thread::sleep_for(kThreadsEnd);
         }
         deleteQueues();
