@@ -16,11 +16,7 @@ namespace ventras {
 using Names = std::vector<std::string>;
 
 /// How many times the time and the memory of a release build a run may take.
-#if defined(__SANITIZE_ADDRESS__) || defined(__SANITIZE_THREAD__)
-inline constexpr int kAllowance = 5;
-#else
-inline constexpr int kAllowance = 1;
-#endif
+inline constexpr int kAllowance = VENTRAS_TEST_ALLOWANCE;
 
 /// Filter lines and commands as they stand in a PPD when a text has broken out of its own line.
 inline constexpr std::string_view kSmuggled =
