@@ -28,7 +28,7 @@ constexpr std::array kExplanations{
                 "its description cannot be stored, or the print server has no address"},
     Explanation{QueueStatus::kNoIdentifier, "no queue name can be made of its name"},
     Explanation{PrintSystemStatus::kBadData, "its settings are not safe to use"},
-    Explanation{PrintSystemStatus::kUnavailable, "the print scheduler does not answer"},
+    Explanation{PrintSystemStatus::kUnavailable, "the print scheduler, or the printer itself, does not answer"},
     Explanation{PrintSystemStatus::kCannotCreate, "the print scheduler refuses the queue"},
     Explanation{PrintSystemStatus::kNoPermission, "the print scheduler does not let this user make queues"},
 };

@@ -228,7 +228,7 @@ TEST_F(IppUsbPrinter, GetsNoQueueWhileItIsRegisteredButDoesNotAnswer) {
     gone.port = freePort();
     responder_.publish(gone);
     const auto run = runAgent();
-    EXPECT_EQ(run.exitStatus, PrintSystemStatus::kBadData) << run.story();
+    EXPECT_EQ(run.exitStatus, PrintSystemStatus::kUnavailable) << run.story();
     EXPECT_EQ(scheduler_.queues(), Names{});
     EXPECT_EQ(agent_.leftovers(), Names{});
 }

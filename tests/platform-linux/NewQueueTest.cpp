@@ -92,6 +92,12 @@ TEST(NewQueue, IsRefusedForOtherDevices) {
         EXPECT_EQ(statusOf(parse(with("Printer URI", uri))), PrintSystemStatus::kBadData) << uri;
 }
 
+TEST(NewQueue, IsNotAvailableWhereThePrinterGaveNothingToMakeADriverOf) {
+    auto attributes = with("Printer URI", "ippusb://Laser._ipp._tcp.local./");
+    attributes.erase("com.quillon.print.PrinterInfo.PPD");
+    EXPECT_EQ(statusOf(parse(attributes)), PrintSystemStatus::kUnavailable);
+}
+
 TEST(NewQueue, IsRefusedWithControlCharacters) {
     for (const auto* text : {"a\nb", "a\tb", "a\rb",
                              "a\x7f"
