@@ -1,9 +1,7 @@
 // How long the agent takes to make queues for IPP printers, against the print system's own tool for the same
 // printers in the same run: a real scheduler, a real virtual printer, and scripted printers by the dozen.
 #include <chrono>
-#include <cstdio>
 #include <cstdlib>
-#include <exception>
 #include <memory>
 #include <stdexcept>
 #include <string>
@@ -167,24 +165,17 @@ private:
     TemporaryFolder preferences_;
 };
 
-int run() {
-    SpeedTable table;
+void measure(SpeedTable& table) {
     IppQueueBench bench;
     bench.onePrinter(table);
     bench.manyPrintersAtOnce(table);
     bench.manySlowPrinters(table);
     bench.oneSilentPrinter(table);
-    return table.print() ? 0 : 1;
 }
 
 }  // namespace
 }  // namespace ventras
 
 int main() {
-    try {
-        return ventras::run();
-    } catch (const std::exception& error) {
-        std::fprintf(stderr, "ipp-queue-bench: %s\n", error.what());
-        return 1;
-    }
+    return ventras::tabulate("ipp-queue-bench", ventras::measure);
 }

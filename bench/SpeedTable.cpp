@@ -4,6 +4,7 @@
 #include <array>
 #include <cmath>
 #include <cstdio>
+#include <exception>
 
 namespace ventras {
 namespace {
@@ -37,6 +38,17 @@ bool SpeedTable::print() const {
         std::printf("%-66s %14s %14s  %s\n", what.c_str(), measured.c_str(), target.c_str(), verdict);
     }
     return std::ranges::all_of(rows_, &Row::reached);
+}
+
+int tabulate(const char* program, const std::function<void(SpeedTable&)>& bench) {
+    try {
+        SpeedTable table;
+        bench(table);
+        return table.print() ? 0 : 1;
+    } catch (const std::exception& error) {
+        std::fprintf(stderr, "%s: %s\n", program, error.what());
+        return 1;
+    }
 }
 
 double median(std::vector<double> figures) {

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <functional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -27,6 +28,11 @@ private:
     };
     std::vector<Row> rows_;
 };
+
+/// Has a bench fill its table, and prints it.
+/// @param program the bench's name, for what goes wrong
+/// @return exit status: 0 when every figure reaches its target, else 1.
+int tabulate(const char* program, const std::function<void(SpeedTable&)>& bench);
 
 /// The middle one of some figures, the upper one where there are two. There must be at least one.
 double median(std::vector<double> figures);

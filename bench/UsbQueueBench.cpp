@@ -2,9 +2,7 @@
 // requests that this takes, in the same run: a real scheduler, real collections of drivers among as many
 // others as a distribution brings, and an emulated USB.
 #include <array>
-#include <cstdio>
 #include <cstdlib>
-#include <exception>
 #include <filesystem>
 #include <map>
 #include <stdexcept>
@@ -162,20 +160,13 @@ private:
     TemporaryFolder preferences_;
 };
 
-int run() {
-    SpeedTable table;
+void measure(SpeedTable& table) {
     UsbQueueBench(kOtherDrivers).measure(table);
-    return table.print() ? 0 : 1;
 }
 
 }  // namespace
 }  // namespace ventras
 
 int main() {
-    try {
-        return ventras::run();
-    } catch (const std::exception& error) {
-        std::fprintf(stderr, "usb-queue-bench: %s\n", error.what());
-        return 1;
-    }
+    return ventras::tabulate("usb-queue-bench", ventras::measure);
 }
