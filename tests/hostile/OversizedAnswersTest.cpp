@@ -11,7 +11,8 @@ namespace {
 using namespace std::chrono_literals;
 using namespace std::string_literals;
 
-constexpr int kMany = 100'000;
+// libcups moves all it has for each one that it adds, and sanitizers watch every move.
+constexpr int kVeryMany = kAllowance > 1 ? 30'000 : 100'000;
 constexpr long kMostKilobytes = 300'000 * kAllowance;
 constexpr auto kLongest = 20s * kAllowance;
 
@@ -27,7 +28,7 @@ void PrintTo(const OversizedCase& row, std::ostream* out) {
 
 std::vector<RawAttribute> manyAttributes() {
     std::vector<RawAttribute> all;
-    for (int i = 0; i < kMany; ++i)
+    for (int i = 0; i < kVeryMany; ++i)
         all.push_back({IPP_TAG_KEYWORD, "x-" + std::to_string(i), "y"});
     return all;
 }
@@ -35,7 +36,7 @@ std::vector<RawAttribute> manyAttributes() {
 // Values of one attribute: those behind the first come without a name.
 std::vector<RawAttribute> manyValues(const char* name, ipp_tag_t tag, const std::string& value) {
     std::vector<RawAttribute> all{{tag, name, value}};
-    all.resize(kMany, {tag, "", value});
+    all.resize(kVeryMany, {tag, "", value});
     return all;
 }
 
@@ -57,19 +58,19 @@ protected:
 INSTANTIATE_TEST_SUITE_P(
     All, OversizedAnswers,
     testing::Values(
-        OversizedCase{"AHundredThousandAttributes", manyAttributes, 0},
-        OversizedCase{"AHundredThousandSizes",
+        OversizedCase{"VeryManyAttributes", manyAttributes, 0},
+        OversizedCase{"VeryManySizes",
                       [] { return manyValues("media-supported", IPP_TAG_KEYWORD, "iso_a4_210x297mm"); }, 0},
-        OversizedCase{"AHundredThousandResolutions",
+        OversizedCase{"VeryManyResolutions",
                       [] {
                           return manyValues("printer-resolution-supported", IPP_TAG_RESOLUTION,
                                             "\0\0\2\x58\0\0\2\x58\3"s);
                       },
                       0},
-        OversizedCase{"AHundredThousandFormats",
+        OversizedCase{"VeryManyFormats",
                       [] { return manyValues("document-format-supported", IPP_TAG_MIMETYPE, "image/urf"); },
                       0},
-        OversizedCase{"AHundredThousandNames",
+        OversizedCase{"VeryManyNames",
                       [] { return manyValues("printer-dns-sd-name", IPP_TAG_NAME, "Victim"); }, 0},
         OversizedCase{"ACollectionForEachThing", [] { return collections(3); }, 0},
         OversizedCase{"CollectionsDeepWithinCollections", [] { return collections(10'000); }, 255},
