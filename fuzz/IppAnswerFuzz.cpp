@@ -12,7 +12,7 @@
 #include "fuzz/PPDChecks.h"
 #include "fuzz/RecordChecks.h"
 #include "fuzz/Require.h"
-#include "platform/CollectionNesting.h"
+#include "platform/MessageLimits.h"
 #include "platform/PropertyList.h"
 #include "platform/Utf8.h"
 #include "platform/linux/options/DriverlessPpd.h"
@@ -112,8 +112,8 @@ void checkPPD(ipp_t* answer, PrinterService service) {
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
     static FakePlatform fake;
     static PPDManager drivers(fake.platform);
-    const bool nestsTooDeep = !CollectionNesting().follow({data, size});
-    const auto answer = nestsTooDeep ? nullptr : decodeIpp({reinterpret_cast<const char*>(data), size});
+    const bool isRefused = !MessageLimits().follow({data, size});
+    const auto answer = isRefused ? nullptr : decodeIpp({reinterpret_cast<const char*>(data), size});
     if (!answer)
         return 0;
     checkDescription(dictionaryFrom(answer.get()), fake, drivers);

@@ -43,7 +43,7 @@ ssize_t ResponseBody::give(void* self, ipp_uchar_t* bytes, std::size_t count) {
         body.begin_ += taken;
         given += taken;
     }
-    return body.nesting_.follow({bytes, given}) ? static_cast<ssize_t>(given) : -1;
+    return body.limits_.follow({bytes, given}) ? static_cast<ssize_t>(given) : -1;
 }
 
 IppPtr ResponseBody::readMessage() {

@@ -3,8 +3,8 @@
 #include <array>
 #include <cstddef>
 
-#include "platform/CollectionNesting.h"
 #include "platform/Handles.h"
+#include "platform/MessageLimits.h"
 
 namespace ventras {
 
@@ -19,7 +19,8 @@ public:
     /// @param connection its response's header has been read
     explicit ResponseBody(http_t* connection) : connection_(connection) {}
 
-    /// The message; empty when it is none, ends too early, is too large, or nests too deep.
+    /// The message; empty when it is none, ends too early, is too large, nests too deep, or has
+    /// too many values.
     IppPtr readMessage();
 
     /// Writes what follows the message to a file. @return false when it ended too early or cannot be written.
@@ -30,7 +31,7 @@ private:
     bool refill();
 
     http_t* connection_;
-    CollectionNesting nesting_;
+    MessageLimits limits_;
     std::array<char, 65536> block_;
     std::size_t begin_ = 0;
     std::size_t end_ = 0;

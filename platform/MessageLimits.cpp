@@ -1,4 +1,4 @@
-#include "platform/CollectionNesting.h"
+#include "platform/MessageLimits.h"
 
 #include <cups/ipp.h>
 
@@ -6,7 +6,7 @@
 
 namespace ventras {
 
-bool CollectionNesting::follow(std::span<const std::uint8_t> bytes) {
+bool MessageLimits::follow(std::span<const std::uint8_t> bytes) {
     while (!bytes.empty() && field_ != Field::End) {
         const auto part = bytes.first(std::min(missing_, bytes.size()));
         if (field_ == Field::Tag || field_ == Field::NameLength || field_ == Field::ValueLength)
@@ -20,7 +20,7 @@ bool CollectionNesting::follow(std::span<const std::uint8_t> bytes) {
     return true;
 }
 
-bool CollectionNesting::finishField() {
+bool MessageLimits::finishField() {
     switch (field_) {
         case Field::Tag:
             return take(number_);
@@ -38,7 +38,7 @@ bool CollectionNesting::finishField() {
     return expect(Field::Tag, 1);
 }
 
-bool CollectionNesting::take(std::uint32_t tag) {
+bool MessageLimits::take(std::uint32_t tag) {
     if (tag == IPP_TAG_END)
         return expect(Field::End, 0);
     if (tag < IPP_TAG_UNSUPPORTED_VALUE)
@@ -49,10 +49,11 @@ bool CollectionNesting::take(std::uint32_t tag) {
         ++depth_;
     else if (tag == IPP_TAG_END_COLLECTION)
         --depth_;
-    return depth_ >= 0 && depth_ <= kDeepest && expect(Field::NameLength, 2);
+    ++values_;
+    return depth_ >= 0 && depth_ <= kDeepest && values_ <= kMostValues && expect(Field::NameLength, 2);
 }
 
-bool CollectionNesting::expect(Field field, std::size_t length) {
+bool MessageLimits::expect(Field field, std::size_t length) {
     field_ = field;
     missing_ = length;
     number_ = 0;

@@ -1,4 +1,4 @@
-#include "platform/CollectionNesting.h"
+#include "platform/MessageLimits.h"
 
 #include <gtest/gtest.h>
 
@@ -29,54 +29,65 @@ std::string nested(int depth) {
 }
 
 bool passes(const std::string& bytes, std::size_t atOnce = std::string::npos) {
-    CollectionNesting nesting;
+    MessageLimits limits;
     for (std::size_t at = 0; at < bytes.size(); at += std::min(atOnce, bytes.size())) {
         const auto part = bytes.substr(at, atOnce);
-        if (!nesting.follow({reinterpret_cast<const std::uint8_t*>(part.data()), part.size()}))
+        if (!limits.follow({reinterpret_cast<const std::uint8_t*>(part.data()), part.size()}))
             return false;
     }
     return true;
 }
 
-TEST(CollectionNesting, IsNoneInAMessageWithoutCollections) {
+TEST(Nesting, IsNoneInAMessageWithoutCollections) {
     EXPECT_TRUE(passes(kHeader + rawAttribute(IPP_TAG_NAME, "printer-name", "4444") + kEndOfMessage));
 }
 
-TEST(CollectionNesting, MayBeSixteenDeep) {
+TEST(Nesting, MayBeSixteenDeep) {
     EXPECT_TRUE(passes(kHeader + nested(16) + kEndOfMessage));
     EXPECT_FALSE(passes(kHeader + nested(17) + kEndOfMessage));
     EXPECT_FALSE(passes(kHeader + nested(100'000) + kEndOfMessage));
 }
 
-TEST(CollectionNesting, IsSeenHoweverTheBytesArrive) {
+TEST(Nesting, IsSeenHoweverTheBytesArrive) {
     for (const std::size_t atOnce : {1U, 2U, 3U, 7U, 64U}) {
         EXPECT_TRUE(passes(kHeader + nested(16) + kEndOfMessage, atOnce)) << atOnce;
         EXPECT_FALSE(passes(kHeader + nested(17) + kEndOfMessage, atOnce)) << atOnce;
     }
 }
 
-TEST(CollectionNesting, DoesNotGrowWithCollectionsSideBySide) {
+TEST(Nesting, DoesNotGrowWithCollectionsSideBySide) {
     EXPECT_TRUE(passes(kHeader + repeated(nested(2), 1000) + kEndOfMessage));
 }
 
-TEST(CollectionNesting, IsNotToldByBytesInNamesAndValues) {
+TEST(Nesting, IsNotToldByBytesInNamesAndValues) {
     const auto names = rawAttribute(IPP_TAG_NAME, "4", "4") + rawAttribute(IPP_TAG_NAME, "7", "7");
     EXPECT_TRUE(passes(kHeader + repeated(names, 100) + kEndOfMessage));
     EXPECT_FALSE(
         passes(kHeader + repeated(kBegin + rawAttribute(IPP_TAG_NAME, "7", "7"), 17) + kEndOfMessage));
 }
 
-TEST(CollectionNesting, EndsWithTheMessage) {
+TEST(Nesting, EndsWithTheMessage) {
     EXPECT_TRUE(passes(kHeader + kEndOfMessage + repeated(kBegin, 100)));
 }
 
-TEST(CollectionNesting, DoesNotEndBeforeItBegins) {
+TEST(Nesting, DoesNotEndBeforeItBegins) {
     EXPECT_FALSE(passes(kHeader + kEnd + kEndOfMessage));
 }
 
 // RFC 8010 and libcups read the bytes behind it differently.
-TEST(CollectionNesting, AllowsNoExtensionTag) {
+TEST(MessageLimits, AllowNoExtensionTag) {
     EXPECT_FALSE(passes(kHeader + rawAttribute(IPP_TAG_EXTENSION, "x", "\0\0\0\x34"s) + kEndOfMessage));
+}
+
+TEST(MessageLimits, AllowAQuarterOfAMillionValues) {
+    const auto value = rawAttribute(IPP_TAG_NAME, "", "n");
+    EXPECT_TRUE(passes(kHeader + repeated(value, 250'000) + kEndOfMessage));
+    EXPECT_FALSE(passes(kHeader + repeated(value, 250'001) + kEndOfMessage));
+}
+
+TEST(MessageLimits, CountNoGroupsAndTheMembersOfCollections) {
+    EXPECT_TRUE(passes(kHeader + repeated("\4"s, 250'001) + kEndOfMessage));
+    EXPECT_FALSE(passes(kHeader + repeated(nested(2), 50'001) + kEndOfMessage));
 }
 
 }  // namespace

@@ -6,16 +6,20 @@
 
 namespace ventras {
 
-/// Watches how deep the collections of an IPP message nest (RFC 8010 section 3.1) while its bytes go by.
-/// libcups calls itself for each level, and has no limit but the end of the stack. One thread at a time.
-class CollectionNesting {
+/// Watches how deep the collections of an IPP message nest and how many values it has (RFC 8010 section 3.1)
+/// while its bytes go by. libcups calls itself for each level and keeps 400 bytes for a value of one byte,
+/// and its only limits are the ends of stack and memory. One thread at a time.
+class MessageLimits {
 public:
     /// Deeper than the collections of any printer, which are media in lists, and sizes within media.
     static constexpr int kDeepest = 16;
 
+    /// Values of all attributes; six of them tell of a driver in a catalogue.
+    static constexpr int kMostValues = 250'000;
+
     /// Takes the next bytes of the message; those behind its end do not count.
-    /// @return false when collections nest too deep or end without a beginning, or when there is a tag that
-    /// nobody uses and that readers understand differently.
+    /// @return false when collections nest too deep or end without a beginning, when there are too many
+    /// values, or when there is a tag that nobody uses and that readers understand differently.
     bool follow(std::span<const std::uint8_t> bytes);
 
 private:
@@ -29,6 +33,7 @@ private:
     std::size_t missing_ = 8;  // bytes of the field
     std::uint32_t number_ = 0;
     int depth_ = 0;
+    int values_ = 0;
 };
 
 }  // namespace ventras
