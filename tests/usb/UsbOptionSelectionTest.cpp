@@ -166,6 +166,16 @@ TEST_F(UsbAutoSelect, FindsThePrinterByTheSerialNumberOfItsDescriptor) {
     EXPECT_TRUE(product("usb://Example/PS%209000?serial=A1"));
 }
 
+TEST_F(UsbAutoSelect, ReadsTheDeviceIDAsItWasReadForTheURI) {
+    for (const auto* deviceID : {"MFG:Example;MDL:PS 9000;CMD:POSTSCRIPT; SN:A1;",
+                                 "MFG:Example;MDL:PS 9000; cmd:PostScript;\tsern:A1;",
+                                 "MFG:Example;MDL:PS 9000;command set:PS;srn:A1"}) {
+        attach({.deviceID = deviceID, .serialNumber = "on the bus"});
+        EXPECT_TRUE(product()) << deviceID << ": " << testing::PrintToString(fakes.log.lines());
+        bench.unplug("1-4");
+    }
+}
+
 TEST_F(UsbAutoSelect, AsksOneOfSeveralPrinters) {
     auto other = postScriptModel();
     other.deviceID = "MFG:Example;MDL:PS 9000;CMD:POSTSCRIPT;SN:B2;";

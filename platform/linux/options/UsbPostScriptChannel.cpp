@@ -5,6 +5,7 @@
 #include <chrono>
 #include <utility>
 
+#include "deviceid/TextScan.h"
 #include "platform/linux/options/PostScriptReply.h"
 
 namespace ventras {
@@ -23,21 +24,17 @@ constexpr std::string_view kEndOfJob = "\x04";
 constexpr std::string_view kUniversalExit = "\x1b%-12345X";
 constexpr std::string_view kEnterPostScript = "@PJL ENTER LANGUAGE=POSTSCRIPT\r\n";
 
-bool namesIgnoringCase(std::string_view text, std::string_view upperCaseWord) {
-    const auto isSame = [](char c, char upperCase) {
-        return (c >= 'a' && c <= 'z' ? static_cast<char>(c - 'a' + 'A') : c) == upperCase;
-    };
-    return std::search(text.begin(), text.end(), upperCaseWord.begin(), upperCaseWord.end(), isSame) !=
-           text.end();
+bool names(std::string_view text, std::string_view word) {
+    return TextScan::findIgnoringCase(text, word) != std::string_view::npos;
 }
 
 /// Whether a command set names PostScript, e.g. "PCL,PostScript" or "PJL,PS".
 bool takesPostScript(const std::string& commandSet) {
-    if (namesIgnoringCase(commandSet, "POSTSCRIPT"))
+    if (names(commandSet, "PostScript"))
         return true;
     std::string list = "," + commandSet + ",";
     std::erase(list, ' ');
-    return namesIgnoringCase(list, ",PS,");
+    return names(list, ",PS,");
 }
 
 }  // namespace
@@ -93,7 +90,7 @@ UsbPostScriptChannel::~UsbPostScriptChannel() {
 
 /// The program, and a second one that prints the marker: it runs whatever became of the first.
 std::string UsbPostScriptChannel::jobs(std::string_view program, std::string_view marker) const {
-    const bool isPjl = namesIgnoringCase(place_.commandSet, "PJL");
+    const bool isPjl = names(place_.commandSet, "PJL");
     std::string text;
     if (isPjl)
         text.append(kUniversalExit).append(kEnterPostScript);

@@ -7,7 +7,11 @@
 #include <charconv>
 #include <span>
 #include <string_view>
+#include <system_error>
+#include <utility>
 #include <vector>
+
+#include "deviceid/PMStringAdditions.h"
 
 namespace ventras {
 namespace {
@@ -16,9 +20,6 @@ using namespace std::string_view_literals;
 
 constexpr unsigned kWait = 5000;  // milliseconds
 constexpr std::uint8_t kBidirectional = 2;
-
-constexpr std::array kSerialNumberKeys{"SN"sv, "SRN"sv, "SERN"sv};
-constexpr std::array kCommandSetKeys{"CMD"sv, "COMMAND SET"sv};
 
 /// What a URI says of its printer.
 struct Wanted {
@@ -32,6 +33,18 @@ std::string withoutPlus(std::string text) {
     return text;
 }
 
+/// What follows a name at the beginning of a query; absent when the query begins otherwise.
+std::optional<std::string_view> valueBehind(std::string_view name, std::string_view query) {
+    return query.starts_with(name) ? std::optional{query.substr(name.size())} : std::nullopt;
+}
+
+std::optional<std::uint32_t> hexadecimal(std::string_view digits) {
+    std::uint32_t number = 0;
+    const auto* end = digits.data() + digits.size();
+    const auto [stop, error] = std::from_chars(digits.data(), end, number, 16);
+    return error == std::errc{} && stop == end ? std::optional{number} : std::nullopt;
+}
+
 std::optional<Wanted> wantedBy(const std::string& deviceURI) {
     std::array<char, 32> scheme{};
     std::array<char, 1024> user{}, host{}, resource{};
@@ -41,21 +54,18 @@ std::optional<Wanted> wantedBy(const std::string& deviceURI) {
                         user.size(), host.data(), host.size(), &port, resource.data(), resource.size());
     if (status < HTTP_URI_STATUS_OK || scheme.data() != "usb"sv)
         return std::nullopt;
-    const std::string_view path = resource.data();
-    Wanted wanted;
-    const auto question = path.rfind('?');
-    const auto query = question == path.npos ? std::string_view{} : path.substr(question + 1);
-    wanted.model =
-        path.substr(std::min<std::size_t>(1, path.size()), question == path.npos ? question : question - 1);
-    if (query.starts_with("serial="))
-        wanted.serialNumber = withoutPlus(std::string(query.substr(7)));
-    if (query.starts_with("location=")) {
-        std::uint32_t location = 0;
-        const auto digits = query.substr(9);
-        const auto end = std::from_chars(digits.data(), digits.data() + digits.size(), location, 16).ptr;
-        if (!digits.empty() && end == digits.data() + digits.size())
-            wanted.location = location;
-    }
+    std::string_view path = resource.data();
+    const auto question = std::min(path.rfind('?'), path.size());
+    const auto query = path.substr(std::min(question + 1, path.size()));
+    path = path.substr(0, question);
+    if (path.starts_with('/'))
+        path.remove_prefix(1);
+
+    Wanted wanted{std::string(path), {}, {}};
+    if (const auto serialNumber = valueBehind("serial=", query))
+        wanted.serialNumber = withoutPlus(std::string(*serialNumber));
+    if (const auto location = valueBehind("location=", query))
+        wanted.location = hexadecimal(*location);
     return wanted.location || !wanted.serialNumber.empty() ? std::optional{wanted} : std::nullopt;
 }
 
@@ -80,23 +90,6 @@ std::string deviceIDOf(libusb_device_handle* handle, const LibusbDevice& device,
     const auto text =
         std::span(reply).first(std::clamp<std::size_t>(length, 2, static_cast<std::size_t>(received)));
     return {text.begin() + 2, text.end()};
-}
-
-/// The value of the first component of a device ID that has one of the keys.
-std::string valueOf(std::string_view deviceID, std::span<const std::string_view> keys) {
-    while (!deviceID.empty()) {
-        const auto component = deviceID.substr(0, deviceID.find(';'));
-        const auto colon = component.find(':');
-        const auto isKey = [&](std::string_view key) {
-            return std::ranges::equal(component.substr(0, colon), key, {}, [](char c) {
-                return c >= 'a' && c <= 'z' ? static_cast<char>(c - 'a' + 'A') : c;
-            });
-        };
-        if (colon != component.npos && std::ranges::any_of(keys, isKey))
-            return std::string(component.substr(colon + 1));
-        deviceID.remove_prefix(std::min(component.size() + 1, deviceID.size()));
-    }
-    return {};
 }
 
 /// The serial number of the device's own descriptors, cut down to 8-bit characters as in queues' URIs.
@@ -134,13 +127,15 @@ Verdict examine(const LibusbDevicePtr& device, const LibusbInterface& interface,
     const auto id =
         deviceIDOf(handle.get(), *device, interface.number, setting->descriptor.bAlternateSetting);
     if (!wanted.location) {
-        auto serial = valueOf(id, kSerialNumberKeys);
+        // Read as the agent read it for the URI.
+        auto serial = PMStringAdditions::serialNumber(id).value_or("");
         if (serial.empty())
             serial = descriptorSerialNumber(handle.get(), device->device.get());
         if (withoutPlus(serial) != wanted.serialNumber)
             return "no printer has that serial number";
     }
-    return Candidate{{device, interface.number, *setting, valueOf(id, kCommandSetKeys)}, id};
+    auto commandSet = PMStringAdditions::commandSet(id).value_or("");
+    return Candidate{{device, interface.number, *setting, std::move(commandSet)}, id};
 }
 
 }  // namespace
