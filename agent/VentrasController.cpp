@@ -18,8 +18,7 @@
 namespace ventras {
 namespace {
 
-constexpr std::uint64_t kBrowsedDeviceTypes = 258;
-constexpr std::uint64_t kIppUsbDeviceTypes = 0xfe00;  // further ones, among which such a printer's scanner is
+constexpr std::uint64_t kBrowsedDeviceTypes = ImageDeviceTypes::kScanners | ImageDeviceTypes::kReachable;
 constexpr std::int64_t kNothingStarted = -1;
 constexpr std::int64_t kSoftwareNotOffered = 1;
 constexpr std::int64_t kUserCancelled = -128;
@@ -58,7 +57,7 @@ void VentrasController::startDeviceBrowser(const Request& request) {
     deviceBrowser_->setBrowsedDeviceTypeMask(kBrowsedDeviceTypes);
     if (request.namesIppUsbPrinter)
         deviceBrowser_->setBrowsedDeviceTypeMask(deviceBrowser_->browsedDeviceTypeMask() |
-                                                 kIppUsbDeviceTypes);
+                                                 ImageDeviceTypes::kRegisteredHere);
     deviceBrowser_->start();
 }
 
@@ -85,10 +84,10 @@ void VentrasController::queueOperationCompleted(const VentraOperation& operation
     if (status == QueueStatus::kNoDriver && downloadDrivers_) {
         if (!seenThisPrinter(*operation.printer()))
             downloadOperation_->addPrinterForSoftwareUpdate(operation.printer());
-    } else if (status != QueueStatus::kCreated && status != QueueStatus::kAlreadyExists) {
-        exitStatus_ = static_cast<std::uint64_t>(std::int64_t{status});
-    } else {
+    } else if (QueueStatus::isServed(status)) {
         printersAdded_.insert(operation.printer());
+    } else {
+        exitStatus_ = static_cast<std::uint64_t>(std::int64_t{status});
     }
 }
 
@@ -115,8 +114,9 @@ bool VentrasController::considerSoftwareFor(VentrasPrinterObject& printer) {
     const auto scanID = printer.softwareUpdateScanDeviceID();
     if (!scanID)
         return false;
-    const auto reply = platform_.printToolAgent.sendCommandSync(
-        PrintToolAgentChannel::kService, PrintToolAgentChannel::kCountDriverPackages, {{"scanID", *scanID}});
+    const auto reply = platform_.printToolAgent.sendCommandSync(PrintToolAgentChannel::kService,
+                                                                PrintToolAgentChannel::kCountDriverPackages,
+                                                                {{PrintToolAgentKeys::kScanID, *scanID}});
     const auto count = packageCount(reply);
     const auto* usbPrinter = skerrow_ ? dynamic_cast<const USBPrinterObject*>(&printer) : nullptr;
     if (usbPrinter != nullptr) {
@@ -125,7 +125,7 @@ bool VentrasController::considerSoftwareFor(VentrasPrinterObject& printer) {
             {{"1284 DeviceID", usbPrinter->deviceID().value_or("")}, {"Match", count}});
         return false;
     }
-    return count == 1 && !reply.dictionary.contains("conflicts");
+    return count == 1 && !reply.dictionary.contains(PrintToolAgentKeys::kConflicts);
 }
 
 void VentrasController::offerSoftware(std::span<const DevicePtr> offered) {
@@ -143,8 +143,8 @@ void VentrasController::offerSoftware(std::span<const DevicePtr> offered) {
     }
     platform_.installer.setTitle(promptTitle(platform_.strings, offered));
     platform_.installer.setInstalledPrintersList(
-        {{"InstalledPrinters", PropertyArray(scanIDs.begin(), scanIDs.end())},
-         {"Manufacturers", std::move(manufacturers)}});
+        {{InstalledPrintersKeys::kPrinters, PropertyArray(scanIDs.begin(), scanIDs.end())},
+         {InstalledPrintersKeys::kManufacturers, std::move(manufacturers)}});
     constexpr bool kConfirmCompletion = false;
     platform_.installer.startWithPredicate(*predicate, kConfirmCompletion);
 }

@@ -1,7 +1,8 @@
 #include "ctl/Explanation.h"
 
 #include <algorithm>
-#include <array>
+#include <optional>
+#include <string>
 
 #include "ctl/Evidence.h"
 #include "ctl/PackageOffer.h"
@@ -14,27 +15,20 @@
 #include "platform/QueueAttributes.h"
 #include "queues/QueueInventory.h"
 #include "queues/QueueMaker.h"
+#include "queues/QueueStatus.h"
 
 namespace ventras {
 namespace {
 
-struct Outcome {
-    std::int32_t status;
-    std::string_view text;
-};
-
-constexpr std::array kOutcomes{
-    Outcome{QueueStatus::kCreated, "a queue would be made"},
-    Outcome{QueueStatus::kAlreadyExists, "nothing: a queue serves it"},
-    Outcome{QueueStatus::kNoDriver, "no queue: no usable driver; software for it would be looked for"},
-    Outcome{QueueStatus::kCannotHandle, "no queue: the device cannot be handled"},
-    Outcome{QueueStatus::kCannotSerialize, "no queue: its description cannot be stored"},
-    Outcome{QueueStatus::kNoIdentifier, "no queue: no identifier can be made of its name"},
-};
-
-std::string_view outcomeOf(std::int32_t status) {
-    const auto known = std::ranges::find(kOutcomes, status, &Outcome::status);
-    return known == kOutcomes.end() ? "no queue: the print system reports this status" : known->text;
+/// What would become of the device.
+std::string outcomeOf(std::int32_t status, const std::optional<std::string>& servingQueue) {
+    if (status == QueueStatus::kCreated)
+        return "a queue would be made";
+    if (status == QueueStatus::kAlreadyExists)
+        return servingQueue == "" ? "nothing: it has no address by which to tell"
+                                  : "nothing: a queue serves it";
+    const auto reason = "no queue: " + std::string(QueueStatus::describe(status));
+    return status == QueueStatus::kNoDriver ? reason + "; software for it would be looked for" : reason;
 }
 
 /// Why a queue is taken to serve a device.
@@ -90,7 +84,7 @@ Object explain(VentrasPrinterObject& device, Services& services) {
     }();
     const bool wantsPackage = status == QueueStatus::kNoDriver;
     const auto offer =
-        wantsPackage ? installedPackageOffer(device.softwareUpdateScanDeviceID()) : OfferedPackage{};
+        wantsPackage ? installedPackageOffer(device.softwareUpdateScanDeviceID()) : PackageChoice{};
     const auto serving = status == QueueStatus::kAlreadyExists ? device.queueID() : std::nullopt;
     return {
         {"device", evidence.device},
@@ -101,7 +95,7 @@ Object explain(VentrasPrinterObject& device, Services& services) {
         {"queueReason", serving ? reasonFor(*serving, device, queues) : Value{}},
         {"driverList", drivers},
         {"status", status},
-        {"outcome", serving == "" ? "nothing: it has no address by which to tell" : outcomeOf(status)},
+        {"outcome", outcomeOf(status, serving)},
         {"difficulty", device.difficulty()},
         {"driverPackage", offer.package},
         {"packageReason", wantsPackage ? Value(offer.reason) : Value()},

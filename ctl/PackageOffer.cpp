@@ -36,7 +36,7 @@ std::string reasonFor(const Packages& candidates, const Packages& best) {
     return "it is made for this device more closely than " + candidates[1]->name;
 }
 
-OfferedPackage offerOf(const Packages& candidates, const Packages& best) {
+PackageChoice offerOf(const Packages& candidates, const Packages& best) {
     return {best.size() == 1 ? std::optional{best.front()->name} : std::nullopt, reasonFor(candidates, best)};
 }
 
@@ -56,7 +56,7 @@ Object packageOffer(const DriverCatalogue& catalogue, std::string_view scanID) {
             {"packageReason", offer.reason}};
 }
 
-OfferedPackage installedPackageOffer(const std::optional<std::string>& scanID) {
+PackageChoice installedPackageOffer(const std::optional<std::string>& scanID) {
     if (!scanID)
         return {std::nullopt, "the device does not tell its make and model"};
     const auto reading = installedCatalogue();
@@ -66,7 +66,7 @@ OfferedPackage installedPackageOffer(const std::optional<std::string>& scanID) {
 }
 
 CatalogueReading installedCatalogue() {
-    return DriverCatalogue::read(locateDataFolder() / "driver-packages.plist");
+    return DriverCatalogue::read(locateDataFolder() / DriverCatalogue::kFileName);
 }
 
 }  // namespace ventras

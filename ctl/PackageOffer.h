@@ -15,14 +15,14 @@ namespace ventras {
 Object packageOffer(const DriverCatalogue& catalogue, std::string_view scanID);
 
 /// The package that would be offered.
-struct OfferedPackage {
+struct PackageChoice {
     std::optional<std::string> package;  ///< absent: none
     std::string reason;                  ///< why this one, or why none
 };
 
 /// What would be offered from the installed catalogue.
 /// @param scanID absent for a device that does not tell its make and model
-OfferedPackage installedPackageOffer(const std::optional<std::string>& scanID);
+PackageChoice installedPackageOffer(const std::optional<std::string>& scanID);
 
 /// The catalogue that comes with this system.
 CatalogueReading installedCatalogue();

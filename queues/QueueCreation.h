@@ -5,24 +5,13 @@
 #include <string>
 
 #include "platform/QueueAttributes.h"
+#include "queues/QueueStatus.h"
 
 namespace ventras {
 
 class QueueInventory;
 class VentrasPrinterObject;
 struct Platform;
-
-/// Outcomes of making a queue that are this system's own; every other value is the print system's.
-namespace QueueStatus {
-inline constexpr std::int32_t kCreated = 0;
-inline constexpr std::int32_t kAlreadyExists =
-    242;  ///< a queue serves the device, or another process makes it
-inline constexpr std::int32_t kNoDriver = 241;
-inline constexpr std::int32_t kCannotHandle = 255;
-inline constexpr std::int32_t kNoDevice = -1;
-inline constexpr std::int32_t kCannotSerialize = -30886;  ///< or the local server's address is not known
-inline constexpr std::int32_t kNoIdentifier = -620;
-}  // namespace QueueStatus
 
 /// What became of one creation.
 struct QueueCreationResult {

@@ -16,9 +16,7 @@ std::int32_t QueueMaker::createQueue(ScannerObject& scanner) {
     QueueCreationResult result{QueueStatus::kAlreadyExists, inventory_.findQueueByDeviceURI(*uri)};
     if (!result.queueID)
         result = scanner.isMFP() ? recordInPrinterQueue(scanner) : createScannerQueue(scanner, *uri);
-    const bool isServed =
-        result.status == QueueStatus::kCreated || result.status == QueueStatus::kAlreadyExists;
-    if (isServed && result.queueID)
+    if (QueueStatus::isServed(result.status) && result.queueID)
         scanner.setQueueID(std::move(result.queueID));
     return result.status;
 }

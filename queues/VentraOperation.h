@@ -5,7 +5,7 @@
 
 #include "devices/VentrasPrinterObject.h"
 #include "platform/Operation.h"
-#include "queues/QueueCreation.h"
+#include "queues/QueueStatus.h"
 
 namespace ventras {
 
