@@ -6,7 +6,6 @@
 #include <algorithm>
 #include <array>
 #include <cstdlib>
-#include <fstream>
 #include <functional>
 #include <iterator>
 #include <system_error>
@@ -15,6 +14,7 @@
 #include "catalogue/ControlData.h"
 #include "deviceid/TextScan.h"
 #include "drivers/PPDManager.h"
+#include "platform/FileContent.h"
 
 namespace ventras {
 namespace {
@@ -62,11 +62,6 @@ public:
 private:
     fs::path path_;
 };
-
-std::string textOf(const fs::path& path) {
-    std::ifstream file(path, std::ios::binary);
-    return {std::istreambuf_iterator<char>(file), {}};
-}
 
 /// The first place below the folder that fits the pattern; empty when none does.
 std::string firstPlace(const fs::path& folder, const char* pattern) {
@@ -171,7 +166,7 @@ PackageContent describedBy(const std::string& control) {
 }  // namespace
 
 PackageReading readUnpackedPackage(const fs::path& folder) {
-    auto package = describedBy(textOf(folder / "DEBIAN/control"));
+    auto package = describedBy(fileContent(folder / "DEBIAN/control").value_or(""));
     if (package.name.empty() || package.version.empty())
         return {std::nullopt, folder.string() + ": no package is unpacked here, with DEBIAN/control"};
     std::error_code error;

@@ -1,8 +1,6 @@
 #include "ctl/CatalogueCommand.h"
 
 #include <array>
-#include <fstream>
-#include <iterator>
 #include <variant>
 
 #include "ctl/Complaint.h"
@@ -14,6 +12,7 @@
 #include "ctl/SchedulerCheck.h"
 #include "ctl/Translation.h"
 #include "drivers/PPDCatalogue.h"
+#include "platform/FileContent.h"
 
 namespace ventras {
 namespace {
@@ -21,12 +20,12 @@ namespace {
 using Records = std::vector<PPDRecord>;
 
 std::variant<Records, Exit> catalogueFromFile(const std::string& path) {
-    std::ifstream file(path, std::ios::binary);
-    if (!file) {
+    const auto text = fileContent(path);
+    if (!text) {
         complain(translated("%@: cannot be read", path));
         return Exit::NotFound;
     }
-    auto records = recordsFromJson(std::string(std::istreambuf_iterator<char>(file), {}));
+    auto records = recordsFromJson(*text);
     if (!records)
         return usageError(translated("%@: no JSON array of driver records", path));
     return *std::move(records);

@@ -1,8 +1,6 @@
 #include "ctl/DeviceCommand.h"
 
 #include <array>
-#include <fstream>
-#include <iterator>
 
 #include "ctl/Complaint.h"
 #include "ctl/Output.h"
@@ -12,6 +10,7 @@
 #include "devices/UsbEnumeration.h"
 #include "devices/UsbInterfaceReader.h"
 #include "download/DownloadTriggerOperation.h"
+#include "platform/FileContent.h"
 #include "platform/TemporaryFile.h"
 
 namespace ventras {
@@ -39,8 +38,7 @@ std::optional<std::string> ppdText(const ScannerObject& scanner) {
     if (!path)
         return std::nullopt;
     const auto file = TemporaryFile::adopt(*std::move(path));
-    std::ifstream stream(file.path(), std::ios::binary);
-    return std::string(std::istreambuf_iterator<char>(stream), {});
+    return fileContent(file.path());
 }
 
 Object scannerAnswers(ScannerObject& scanner) {

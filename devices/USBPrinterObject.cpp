@@ -5,13 +5,12 @@
 #include <algorithm>
 #include <array>
 #include <charconv>
-#include <fstream>
-#include <iterator>
 #include <utility>
 
 #include "deviceid/PMStringAdditions.h"
 #include "deviceid/TextScan.h"
 #include "drivers/PPDManager.h"
+#include "platform/FileContent.h"
 #include "platform/ImageDeviceBrowser.h"
 #include "platform/Platform.h"
 #include "platform/PropertyList.h"
@@ -139,10 +138,8 @@ std::optional<QueueAttributes> USBPrinterObject::driverInfo(const PPDRecord&) {
 /// Some makers gave one serial number to a whole series; those devices are on a list.
 bool USBPrinterObject::mayUseSerialNumber() const {
     const auto path = platform_.resources.pathForResource("NoSerialNumber", "xml");
-    if (!path)
-        return true;
-    std::ifstream file(*path, std::ios::binary);
-    const auto list = parsePropertyList(std::string(std::istreambuf_iterator<char>(file), {}));
+    const auto text = path ? fileContent(*path) : std::nullopt;
+    const auto list = text ? parsePropertyList(*text) : std::nullopt;
     const auto* devices = list ? std::get_if<PropertyDictionary>(&*list) : nullptr;
     return devices == nullptr ||
            !devices->contains(std::to_string(vendorID_) + "/" + std::to_string(productID_));

@@ -2,11 +2,10 @@
 
 #include <algorithm>
 #include <array>
-#include <fstream>
-#include <sstream>
 #include <string_view>
 #include <utility>
 
+#include "platform/FileContent.h"
 #include "platform/IppConnection.h"
 #include "platform/Platform.h"
 #include "platform/ProcessTable.h"
@@ -43,10 +42,8 @@ QueueRecord recordFrom(const PropertyDictionary& entry) {
 
 // Absent when the file is missing or is no list.
 std::optional<QueueRecords> savedQueues(const std::filesystem::path& path) {
-    const std::ifstream file(path, std::ios::binary);
-    std::ostringstream text;
-    text << file.rdbuf();  // a read error ends the text here, where an iterator over the file would throw
-    const auto list = parsePropertyList(text.view());
+    const auto text = fileContent(path);
+    const auto list = text ? parsePropertyList(*text) : std::nullopt;
     const auto* entries = list ? std::get_if<PropertyArray>(&*list) : nullptr;
     if (entries == nullptr)
         return std::nullopt;

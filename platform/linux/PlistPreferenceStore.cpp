@@ -9,13 +9,12 @@
 #include <cerrno>
 #include <chrono>
 #include <cstdlib>
-#include <fstream>
-#include <iterator>
 #include <string>
 #include <system_error>
 #include <thread>
 
 #include "platform/Deadline.h"
+#include "platform/FileContent.h"
 #include "platform/Log.h"
 #include "platform/PropertyList.h"
 #include "platform/linux/FileDescriptor.h"
@@ -47,11 +46,10 @@ struct Stored {
 };
 
 Stored read(const std::filesystem::path& path) {
-    std::ifstream file(path, std::ios::binary);
-    if (!file)
+    const auto text = fileContent(path);
+    if (!text)
         return {};
-    const std::string text{std::istreambuf_iterator<char>(file), {}};
-    auto list = parsePropertyList(text);
+    auto list = parsePropertyList(*text);
     if (auto* values = list ? std::get_if<PropertyDictionary>(&*list) : nullptr)
         return {true, std::move(*values)};
     return {false, {}};
@@ -69,24 +67,13 @@ FileDescriptor lockFolder(const std::filesystem::path& folder) {
     return descriptor;
 }
 
-bool writeAll(int descriptor, std::string_view text) {
-    while (!text.empty()) {
-        const auto written = write(descriptor, text.data(), text.size());
-        if (written < 0 && errno == EINTR)
-            continue;
-        if (written <= 0)
-            return false;
-        text.remove_prefix(static_cast<std::size_t>(written));
-    }
-    return fsync(descriptor) == 0;
-}
-
 bool replace(const std::filesystem::path& path, std::string_view text) {
     std::string temporary = path.string() + ".XXXXXX";
     const FileDescriptor descriptor{mkostemp(temporary.data(), O_CLOEXEC)};
     if (descriptor.get() < 0)
         return false;
-    if (writeAll(descriptor.get(), text) && rename(temporary.c_str(), path.c_str()) == 0)
+    if (writeAll(descriptor.get(), text) && fsync(descriptor.get()) == 0 &&
+        rename(temporary.c_str(), path.c_str()) == 0)
         return true;
     unlink(temporary.c_str());
     return false;

@@ -74,7 +74,11 @@ TEST_F(MatchCommand, RefusesACatalogueThatIsNone) {
         const auto path = folder_.write("bad.json", content).string();
         EXPECT_EQ(ctl({"match", "--model", "x", "--catalogue", path}).exitStatus, 2) << content;
     }
-    EXPECT_EQ(ctl({"match", "--model", "x", "--catalogue", folder_.path() / "missing"}).exitStatus, 1);
+    for (const auto& path : {folder_ / "missing", folder_.path()}) {
+        const auto run = ctl({"match", "--model", "x", "--catalogue", path});
+        EXPECT_EQ(run.exitStatus, 1) << path;
+        EXPECT_EQ(run.standardError, "ventrasctl: " + path.string() + ": cannot be read\n");
+    }
 }
 
 }  // namespace

@@ -23,7 +23,7 @@ using testing::IsEmpty;
 using testing::UnorderedElementsAre;
 
 std::string content(const std::optional<std::string>& path) {
-    return path ? readFile(std::filesystem::path(*path)) : "nothing";
+    return path ? readFile(*path) : "nothing";
 }
 
 /// More than a few blocks, and nothing that compresses well.
@@ -89,7 +89,7 @@ TEST_F(CopyOfPPD, IsNothingForWhatIsNoFile) {
 }
 
 TEST_F(CopyOfPPD, IsNothingForADamagedCompressedFile) {
-    const auto whole = readFile(std::filesystem::path(writeCompressed(folder_, "a.ppd.gz", longPPD())));
+    const auto whole = readFile(writeCompressed(folder_, "a.ppd.gz", longPPD()));
     for (const std::size_t length : {whole.size() / 2, whole.size() - 9, whole.size() - 4, whole.size() - 1})
         expectNothingFor(folder_.write("cut-" + std::to_string(length), whole.substr(0, length)));
     auto damaged = whole;
@@ -98,7 +98,7 @@ TEST_F(CopyOfPPD, IsNothingForADamagedCompressedFile) {
 }
 
 TEST_F(CopyOfPPD, IsNothingForAFileThatUnfoldsWithoutEnd) {
-    expectNothingFor(writeCompressed(folder_, "bomb.gz", std::string(65 << 20, ' ')));
+    expectNothingFor(writeCompressed(folder_, "bomb.gz", std::string(17 << 20, ' ')));
 }
 
 TEST_F(CopyOfPPD, IsNothingWhenTheDiskIsFull) {

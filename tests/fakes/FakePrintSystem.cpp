@@ -5,8 +5,8 @@
 
 #include <array>
 #include <fstream>
-#include <iterator>
 
+#include "platform/FileContent.h"
 #include "platform/PropertyList.h"
 #include "platform/QueueAttributes.h"
 #include "platform/TemporaryFile.h"
@@ -68,11 +68,6 @@ private:
     FakePrintSystem& owner_;
 };
 
-std::string readFile(const std::string& path) {
-    std::ifstream file(path, std::ios::binary);
-    return {std::istreambuf_iterator<char>(file), {}};
-}
-
 std::optional<std::string> FakePrintSystem::suggestQueueName(const std::string& name, bool unique) {
     const std::lock_guard lock(mutex_);
     if (!suggestsNames)
@@ -94,7 +89,7 @@ std::int32_t FakePrintSystem::createQueue(const std::string&, const std::string&
     if (const auto parsed = parsePropertyList(attributes))
         creation.attributes = std::get<PropertyDictionary>(*parsed);
     if (const auto* path = findText(creation.attributes, QueueAttributeKeys::kPPD))
-        creation.ppdText = readFile(*path);
+        creation.ppdText = fileContent(*path).value_or("");
     creations.push_back(creation);
     const auto status = create(creation);
     if (status == 0)
@@ -122,7 +117,7 @@ std::optional<std::string> FakePrintSystem::copyQueuePPD(const std::string& queu
 
 std::int32_t FakePrintSystem::setQueuePPD(const std::string& queueID, const std::string& ppdPath) {
     const std::lock_guard lock(mutex_);
-    setPPDs.emplace_back(queueID, readFile(ppdPath));
+    setPPDs.emplace_back(queueID, fileContent(ppdPath).value_or(""));
     return 0;
 }
 

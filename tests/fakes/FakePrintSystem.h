@@ -77,7 +77,4 @@ private:
     std::mutex mutex_;
 };
 
-/// The whole of a text file; empty when it cannot be read.
-std::string readFile(const std::string& path);
-
 }  // namespace ventras

@@ -88,11 +88,9 @@ TEST_F(IppUsbQueue, NamesNoPPDWhenThePrinterGaveNone) {
 
 TEST_F(IppUsbQueue, SelectsOptionsOfTheGenericDriverOnABinaryChannel) {
     std::string generic;
-    selection_.onSelect = [&](FakeAutoSelection&, const std::string& path) {
-        generic = readFile(fs::path(path));
-    };
+    selection_.onSelect = [&](FakeAutoSelection&, const std::string& path) { generic = readFile(path); };
     make(kLaser);
-    EXPECT_EQ(generic, readFile(fs::path(*drivers_.genericURFPPD().name)));
+    EXPECT_EQ(generic, readFile(*drivers_.genericURFPPD().name));
     EXPECT_EQ(system_.binaryOK, std::vector{true});
 }
 
@@ -188,7 +186,7 @@ TEST_F(IppUsbFaxQueue, IsMadeBesideThePrinterQueue) {
 TEST_F(IppUsbFaxQueue, IsMadeFromTheGenericDriverUnderTheFaxDriversName) {
     std::vector<std::string> contents;
     selection_.onSelect = [&](FakeAutoSelection&, const std::string& path) {
-        contents.push_back(readFile(fs::path(path)));
+        contents.push_back(readFile(path));
     };
     make(faxing(kLaser));
     ASSERT_EQ(system_.autoSelected.size(), 2U);

@@ -5,8 +5,9 @@
 #include <cerrno>
 #include <cstdlib>
 #include <fstream>
-#include <iterator>
 #include <system_error>
+
+#include "platform/FileContent.h"
 
 namespace ventras {
 namespace {
@@ -47,8 +48,7 @@ fs::path TemporaryFolder::write(std::string_view name, std::string_view content)
 }
 
 std::string readFile(const fs::path& path) {
-    std::ifstream file(path, std::ios::binary);
-    return {std::istreambuf_iterator<char>(file), {}};
+    return fileContent(path).value_or("");
 }
 
 fs::path testDocument(std::string_view name) {

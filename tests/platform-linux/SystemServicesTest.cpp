@@ -206,6 +206,17 @@ TEST(PlistPreferenceStore, KeepsAnUnreadableFileAside) {
     EXPECT_EQ(readFile(folder / "com.quillon.print.ventrasagent.plist.bad"), "not a property list");
 }
 
+TEST(PlistPreferenceStore, LeavesAFolderInTheFilesPlaceAlone) {
+    const TemporaryFolder folder;
+    const auto inside = folder.write("com.quillon.print.ventrasagent.plist/something", "precious");
+    FakeLog log;
+    PlistPreferenceStore store(folder.path(), log);
+    store.setValue(kDomain, "Key", "value");
+    EXPECT_EQ(store.value(kDomain, "Key"), std::nullopt);
+    EXPECT_EQ(readFile(inside), "precious");
+    EXPECT_THAT(log.lines(), ElementsAre(HasSubstr("is not stored: Is a directory")));
+}
+
 TEST(PlistPreferenceStore, MakesItsFolder) {
     const TemporaryFolder folder;
     FakeLog log;

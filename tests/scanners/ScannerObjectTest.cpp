@@ -10,6 +10,7 @@
 #include "devices/USBPrinterObject.h"
 #include "devices/UsbEnumeration.h"
 #include "drivers/PPDManager.h"
+#include "platform/FileContent.h"
 #include "platform/ImageDeviceBrowser.h"
 #include "platform/TemporaryFile.h"
 #include "tests/fakes/FakePlatform.h"
@@ -35,7 +36,7 @@ protected:
         if (!path)
             return std::nullopt;
         const auto file = TemporaryFile::adopt(*path);
-        return readFile(file.path());
+        return fileContent(file.path());
     }
 
     FakeUsbRegistry registry_;

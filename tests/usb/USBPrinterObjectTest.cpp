@@ -271,8 +271,7 @@ TEST_F(NoSerialNumberList, LetsSerialNumbersThroughWhenItIsMissingOrBroken) {
 TEST_F(NoSerialNumberList, ThatIsShippedParses) {
     const auto path = fakes.resources.pathForResource("NoSerialNumber", "xml");
     ASSERT_TRUE(path);
-    std::ifstream file(*path);
-    const std::string text(std::istreambuf_iterator<char>(file), {});
+    const auto text = readFile(*path);
     const auto parsed = parsePropertyList(text);
     ASSERT_TRUE(parsed) << text;
     EXPECT_TRUE(std::holds_alternative<PropertyDictionary>(*parsed));

@@ -4,9 +4,8 @@
 
 #include <algorithm>
 #include <array>
-#include <fstream>
-#include <iterator>
 
+#include "platform/FileContent.h"
 #include "platform/Utf8.h"
 #include "platform/linux/desktop/DBusCall.h"
 
@@ -40,13 +39,8 @@ Name hostnameServiceProperty(const char* property) {
     return usable(g_variant_get_string(value, nullptr));
 }
 
-std::string contentOf(const std::filesystem::path& path) {
-    std::ifstream file(path, std::ios::binary);
-    return {std::istreambuf_iterator<char>(file), {}};
-}
-
 Name firstLineOf(const std::filesystem::path& path) {
-    const auto content = contentOf(path);
+    const auto content = fileContent(path).value_or("");
     return usable(std::string_view(content).substr(0, content.find('\n')));
 }
 
@@ -61,7 +55,7 @@ Name kernelName() {
 Name lookUp(const std::filesystem::path& folder) {
     if (auto name = hostnameServiceProperty("PrettyHostname"))
         return name;
-    const auto pretty = shellAssignment(contentOf(folder / "machine-info"), "PRETTY_HOSTNAME");
+    const auto pretty = shellAssignment(fileContent(folder / "machine-info").value_or(""), "PRETTY_HOSTNAME");
     if (auto name = pretty ? usable(*pretty) : std::nullopt)
         return name;
     if (auto name = firstLineOf(folder / "hostname"))

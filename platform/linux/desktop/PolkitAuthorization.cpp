@@ -8,12 +8,11 @@
 #include <algorithm>
 #include <array>
 #include <cstdlib>
-#include <fstream>
-#include <iterator>
 #include <optional>
 #include <sstream>
 #include <string>
 
+#include "platform/FileContent.h"
 #include "platform/linux/desktop/DBusCall.h"
 
 namespace ventras {
@@ -36,8 +35,7 @@ bool isRoot() {
 // Start time in clock ticks since boot: field 22 of proc(5)'s stat. The command name, field 2, may hold
 // anything.
 std::uint64_t ownStartTime() {
-    std::ifstream file("/proc/self/stat");
-    const std::string line{std::istreambuf_iterator<char>(file), {}};
+    const auto line = fileContent("/proc/self/stat").value_or("");
     const auto nameEnd = line.rfind(')');
     if (nameEnd == std::string::npos)
         return 0;

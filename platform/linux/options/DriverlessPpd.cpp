@@ -6,11 +6,12 @@
 #include <array>
 #include <atomic>
 #include <fstream>
-#include <iterator>
 #include <mutex>
 #include <optional>
 #include <string_view>
+#include <utility>
 
+#include "platform/FileContent.h"
 #include "platform/linux/ppd/DriverRules.h"
 #include "platform/linux/ppd/PpdFile.h"
 
@@ -57,10 +58,11 @@ std::string corrected(std::string text, PrinterService service) {
 }
 
 bool correct(const std::string& path, PrinterService service) {
-    std::ifstream input(path, std::ios::binary);
-    const auto text = corrected({std::istreambuf_iterator<char>(input), {}}, service);
+    auto text = fileContent(path);
+    if (!text)
+        return false;
     std::ofstream output(path, std::ios::binary);
-    output << text;
+    output << corrected(*std::move(text), service);
     return output.flush().good();
 }
 

@@ -1,14 +1,11 @@
 #include "platform/linux/options/UsbOptionSelection.h"
 
-#include <unistd.h>
-
 #include <algorithm>
 #include <array>
-#include <fstream>
-#include <iterator>
 #include <string_view>
 #include <utility>
 
+#include "platform/FileContent.h"
 #include "platform/Handles.h"
 #include "platform/Log.h"
 #include "platform/TemporaryFile.h"
@@ -34,27 +31,12 @@ Deadline sooner(Deadline one, Deadline other) {
     return one.moment() < other.moment() ? one : other;
 }
 
-bool writeAll(int file, std::string_view text) {
-    while (!text.empty()) {
-        const auto written = write(file, text.data(), text.size());
-        if (written <= 0)
-            return false;
-        text.remove_prefix(static_cast<std::size_t>(written));
-    }
-    return true;
-}
-
 std::optional<TemporaryFile> temporaryFileWith(std::string_view text) {
     auto file = TemporaryFile::create();
     if (!file || !writeAll(file->descriptor(), text))
         return std::nullopt;
     file->close();
     return file;
-}
-
-std::string contentOf(const std::string& path) {
-    std::ifstream file(path, std::ios::binary);
-    return {std::istreambuf_iterator<char>(file), {}};
 }
 
 }  // namespace
@@ -112,9 +94,11 @@ std::int32_t UsbOptionSelection::autoSelectInstallableOptions(const std::string&
     const auto queries = installableOptionQueries(ppd.get());
     if (queries.empty())
         return PrintSystemStatus::kSuccess;
-    const auto text = contentOf(ppdPath);
-    const auto newText = withDefaults(text, askAbout(queries));
-    if (newText == text)
+    const auto text = fileContent(ppdPath);
+    if (!text)
+        return PrintSystemStatus::kBadData;
+    const auto newText = withDefaults(*text, askAbout(queries));
+    if (newText == *text)
         return PrintSystemStatus::kSuccess;
     auto file = temporaryFileWith(newText);
     if (!file)
