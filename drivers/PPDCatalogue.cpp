@@ -5,6 +5,7 @@
 #include <optional>
 #include <string>
 #include <string_view>
+#include <system_error>
 #include <thread>
 #include <utility>
 
@@ -98,9 +99,12 @@ private:
 };
 
 // libcups keeps each text once, and to free one it searches thousands: that takes as long as reading them
-// did. Nobody need wait for it.
+// did. Nobody need wait for it, unless there are too many threads already.
 void freeAside(IppPtr response) {
-    std::thread([unused = std::move(response)] {}).detach();
+    try {
+        std::thread([unused = std::move(response)] {}).detach();
+    } catch (const std::system_error&) {
+    }
 }
 
 }  // namespace

@@ -53,13 +53,18 @@ struct Lookup {
 
 HostAddresses resolveBy(Deadline deadline, const std::string& host, int port) {
     const auto lookup = std::make_shared<Lookup>();
-    std::thread([lookup, host, port] {
+    const auto ask = [lookup, host, port] {
         auto found = resolve(host, port);
         const std::lock_guard lock(lookup->mutex);
         lookup->found = std::move(found);
         lookup->isDone = true;
         lookup->done.notify_one();
-    }).detach();
+    };
+    try {
+        std::thread(ask).detach();
+    } catch (const std::system_error& tooMany) {
+        return {nullptr, std::string("no thread can be started to look its name up: ") + tooMany.what()};
+    }
 
     std::unique_lock lock(lookup->mutex);
     if (!lookup->done.wait_until(lock, deadline.moment(), [&] { return lookup->isDone; }))

@@ -3,6 +3,7 @@
 #include <dlfcn.h>
 #include <gmock/gmock.h>
 #include <netdb.h>
+#include <pthread.h>
 
 #include <array>
 #include <chrono>
@@ -93,6 +94,35 @@ TEST(HostAddresses, AreNotWaitedForBeyondTheDeadline) {
     EXPECT_FALSE(found.list);
     EXPECT_THAT(found.failure, HasSubstr("name server"));
     EXPECT_LT(Clock::now() - begin, 1s);
+}
+
+// While one lives, every new thread wants a larger stack than there is memory for.
+class NoMoreThreads {
+public:
+    NoMoreThreads() {
+        pthread_getattr_default_np(&usual_);
+        pthread_attr_t endless{};
+        pthread_getattr_default_np(&endless);
+        pthread_attr_setstacksize(&endless, std::size_t{1} << 47U);
+        pthread_setattr_default_np(&endless);
+        pthread_attr_destroy(&endless);
+    }
+    NoMoreThreads(const NoMoreThreads&) = delete;
+    NoMoreThreads& operator=(const NoMoreThreads&) = delete;
+    ~NoMoreThreads() {
+        pthread_setattr_default_np(&usual_);
+        pthread_attr_destroy(&usual_);
+    }
+
+private:
+    pthread_attr_t usual_{};
+};
+
+TEST(HostAddresses, AreNotLookedUpWhereNoThreadCanBeStarted) {
+    const NoMoreThreads limit;
+    const auto found = HostAddresses::find(std::string(kSlowName), 631, Deadline::after(5s));
+    EXPECT_FALSE(found.list);
+    EXPECT_THAT(found.failure, HasSubstr("no thread can be started"));
 }
 
 TEST(HostAddresses, ThatNobodyTellsEndAConnectionWithinItsLimit) {
