@@ -1,6 +1,6 @@
 #include "devices/IPPUSBObject.h"
 
-#include <cups/http.h>
+#include <cups/cups.h>
 
 #include <algorithm>
 #include <array>
@@ -20,7 +20,6 @@ namespace {
 constexpr const char* kUnknown = "Unknown";
 constexpr const char* kNoSerialNumber = "(null)";  // queues made without a serial number carry it so
 constexpr std::string_view kFaxResource = "ipp/faxout";
-constexpr std::int64_t kFaxPrinterType = 0x40000;  // CUPS_PRINTER_FAX
 
 std::string assembled(const char* scheme, const std::string& host, const std::string& resource) {
     std::array<char, 1024> uri{};
@@ -38,7 +37,7 @@ std::int64_t decimalNumber(const std::optional<std::string>& text) {
 }
 
 bool isFaxQueue(const QueueRecord& queue) {
-    return (queue.printerType.value_or(0) & kFaxPrinterType) != 0;
+    return (queue.printerType.value_or(0) & CUPS_PRINTER_FAX) != 0;
 }
 
 bool isAnyQueue(const QueueRecord&) {

@@ -15,8 +15,8 @@ struct ImageDevice;
 
 /// A device that was found, of any kind; each kind overrides what it can tell.
 ///
-/// An operation's worker thread uses it during a round, the main thread afterwards; only queueID() may be asked
-/// from several threads at once.
+/// An operation's worker thread uses it during a round, the main thread afterwards; only queueID() may be
+/// asked from several threads at once.
 class VentrasPrinterObject {
 public:
     virtual ~VentrasPrinterObject() = default;
@@ -42,10 +42,11 @@ public:
     /// Attributes of the queue to be made with the driver chosen.
     virtual std::optional<QueueAttributes> driverInfo(const PPDRecord&) { return std::nullopt; }
 
-    /// The drivers that fit, in the catalogue's order.
+    /// The drivers that fit, best first; absent for a device that no driver is looked for.
     virtual std::optional<std::vector<PPDRecord>> driverList() { return std::nullopt; }
 
-    /// Why the device cannot be served, in words for the log; absent when nothing is known to be wrong with it.
+    /// Why the device cannot be served, in words for the log; absent when nothing is known to be wrong with
+    /// it.
     virtual std::optional<std::string> difficulty() { return std::nullopt; }
 
     /// Name of the queue that was made for this device, or found to serve it.

@@ -13,9 +13,8 @@ class PrintSystemService;
 namespace PPDFiles {
 
 /// Copies a local PPD, decompressed.
-/// @return absent when the path is, or when the file cannot be read to its end as such: a truncated or
-/// damaged
-///         gzip file, an empty one, one that is no regular file, one too large for a PPD.
+/// @return absent when the path is, or when the file cannot be read to its end: a truncated, damaged or empty
+///         gzip file, what is no regular file, what is too large for a PPD.
 std::optional<std::string> copyOf(const std::optional<std::string>& path);
 
 /// Fetches a driver's PPD: a file of this computer, or from the scheduler (CUPS-Get-PPD).

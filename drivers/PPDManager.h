@@ -27,7 +27,6 @@ public:
     static PPDManager& defaultManager(Platform& platform);
 
     // PPD files and records (Adobe PPD 4.3)
-    // ------------------------------------------------------------------
 
     /// Reads a PPD file, compressed or not. @return absent when libcups cannot open it as a PPD.
     static std::optional<PPDRecord> parsePPD(const std::string& path);
@@ -53,7 +52,6 @@ public:
     static std::string localizedPPD(const std::string& ppd);
 
     // The scheduler's catalogue
-    // ------------------------------------------------------------------------------
 
     /// The catalogue, asked for anew, in the scheduler's order; empty when it does not answer.
     Records ppds() const;
@@ -66,7 +64,6 @@ public:
     std::optional<std::string> ppdFile(const PPDRecord& record) const;
 
     // Drivers for a device
-    // -----------------------------------------------------------------------------------
 
     using Text = std::optional<std::string>;
 
@@ -86,7 +83,6 @@ public:
     std::optional<Records> postscriptPPDs() const;
 
     // Generic drivers
-    // ----------------------------------------------------------------------------------------
 
     /// Copies of the generic records, each looked up once in this manager's life.
     PPDRecord genericPostscriptPPD();
@@ -99,7 +95,6 @@ public:
     PPDRecord genericSystemPPD(std::string_view name) const;
 
     // Drivers that could be installed
-    // ------------------------------------------------------------------------
 
     /// The one driver package for a device; absent when there is none, or more than one.
     std::optional<PPDRecord> softwareUpdateDriverFor(const Text& deviceID, bool vellum) const;

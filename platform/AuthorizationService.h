@@ -5,7 +5,8 @@
 
 namespace ventras {
 
-/// Decides whether this process may administer printers.
+/// Decides whether this process may administer printers. One thread at a time; it may block until the user
+/// has answered.
 class AuthorizationService {
 public:
     virtual ~AuthorizationService() = default;

@@ -29,8 +29,8 @@ HttpGuard::HttpGuard(http_t* connection, Deadline deadline)
 }
 
 HttpGuard::~HttpGuard() {
-    httpSetTimeout(connection_, 0.0, nullptr,
-                   nullptr);  // the deadline that waitOn() reads goes with the guard
+    // The deadline that waitOn() reads goes with the guard.
+    httpSetTimeout(connection_, 0.0, nullptr, nullptr);
 }
 
 }  // namespace ventras

@@ -65,7 +65,7 @@ public:
     virtual std::unique_ptr<UsbDeviceService> deviceOfInterface(const UsbInterfaceHandle& interface) = 0;
     virtual std::unique_ptr<UsbDeviceHandle> openDevice(const UsbDeviceService& service) = 0;
 
-    /// Where the device sits: bus number in the top byte, then one hexadecimal digit a hub port on the way.
+    /// Where the device sits: its usbLocation().
     virtual std::optional<std::uint32_t> interfaceLocation(const UsbInterfaceHandle& interface) = 0;
     virtual std::optional<std::uint8_t> interfaceNumber(const UsbInterfaceHandle& interface) = 0;
 

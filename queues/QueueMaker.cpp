@@ -12,6 +12,7 @@
 #include "devices/ScannerObject.h"
 #include "devices/USBPrinterObject.h"
 #include "devices/VellumProfilePrinterObject.h"
+#include "drivers/PPDKind.h"
 #include "drivers/PPDManager.h"
 #include "platform/Platform.h"
 #include "platform/PrintSystemService.h"
@@ -19,7 +20,7 @@
 namespace ventras {
 namespace {
 
-constexpr unsigned kWorstPrinterKind = 6;
+constexpr unsigned kWorstPrinterKind = PPDKind::kInstalledHpijs;
 
 // The URL names a file of this machine: "file:///path" or "file://localhost/path", with percent-escapes.
 std::optional<std::string> pathFromFileURL(const std::string& url) {

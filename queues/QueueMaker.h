@@ -42,7 +42,8 @@ public:
     InstallableOptions applyInstallableOptions(const std::string& deviceURI, const std::string& ppdPath,
                                                Channel channel);
 
-    /// The first record of a kind up to 6 that is no fax driver; absent when there is none, or no list.
+    /// The first record that is installed, or can be, and is no fax driver: of a kind up to
+    /// PPDKind::kInstalledHpijs. Absent when there is none, or no list.
     static std::optional<PPDRecord> firstPrinterDriver(const std::optional<std::vector<PPDRecord>>& drivers);
 
 private:

@@ -14,8 +14,8 @@ namespace {
 using namespace std::literals;
 
 constexpr std::array kScannerKeywords{"*QLScannerModulePath"sv, "*QLScannerUUID"sv, "*QLICADriver"sv};
-constexpr std::size_t kLongestLine =
-    1025;  // bytes that are compared at once; longer lines are copied in pieces
+// Bytes that are compared at once; longer lines are copied in pieces.
+constexpr std::size_t kLongestLine = 1025;
 
 bool namesScanner(const std::string& ppdPath, const std::string& uuid) {
     const PpdPtr ppd{ppdOpenFile(ppdPath.c_str())};

@@ -1,4 +1,5 @@
 #include <cups/backend.h>
+#include <strings.h>
 
 #include <chrono>
 #include <cstdio>

@@ -31,9 +31,8 @@ struct InstallPlan {
 /// catalogue, which of them are to be had, and what would come and go with them. Called on the package
 /// manager's thread.
 /// @param catalogue file of the driver packages (docs/driver-catalogue.md)
-/// @return the plan; or why there is none: among other reasons, because a package does not come from a
-/// trusted
-///         source, or others would have to go
+/// @return the plan; or why there is none: because a package does not come from a trusted source, for one, or
+///         because others would have to go
 std::variant<InstallPlan, InstallEnd> planInstall(const std::filesystem::path& catalogue,
                                                   const std::string& predicate, PackageKit& packageKit);
 
