@@ -23,8 +23,8 @@ namespace {
 
 constexpr std::chrono::seconds kSlice{1};
 
-// The workers wait for networks, not for each other's memory: a few heaps do for all of them. Each begins with
-// what a run needs, which it would else get page by page.
+// The workers wait for networks, not for each other's memory: a few heaps do for all of them. Each begins
+// with what a run needs, which it would else get page by page.
 void prepareHeaps() {
     constexpr int kHeaps = 4;
     constexpr int kBeginning = 1 << 20;

@@ -70,7 +70,8 @@ int upperBound(ipp_t* size, const char* dimension) {
 
 }  // namespace
 
-void ippAddStringsFromAttribute(PropertyDictionary& dictionary, ipp_attribute_t* attribute, std::string_view key) {
+void ippAddStringsFromAttribute(PropertyDictionary& dictionary, ipp_attribute_t* attribute,
+                                std::string_view key) {
     const auto values = texts(attribute);
     if (values.empty())
         return;
@@ -80,7 +81,8 @@ void ippAddStringsFromAttribute(PropertyDictionary& dictionary, ipp_attribute_t*
     set(dictionary, key, std::move(joined));
 }
 
-void ippAddStringFromAttribute(PropertyDictionary& dictionary, ipp_attribute_t* attribute, std::string_view key) {
+void ippAddStringFromAttribute(PropertyDictionary& dictionary, ipp_attribute_t* attribute,
+                               std::string_view key) {
     if (auto value = firstText(attribute))
         set(dictionary, key, std::move(*value));
 }
@@ -92,7 +94,8 @@ void ippAddStringArrayFromAttribute(PropertyDictionary& dictionary, ipp_attribut
         set(dictionary, key, PropertyArray(values.begin(), values.end()));
 }
 
-void ippAddProductFromAttribute(PropertyDictionary& dictionary, ipp_attribute_t* attribute, std::string_view key) {
+void ippAddProductFromAttribute(PropertyDictionary& dictionary, ipp_attribute_t* attribute,
+                                std::string_view key) {
     if (const auto value = firstText(attribute))
         set(dictionary, key, "(" + *value + ")");
 }
@@ -106,8 +109,8 @@ void ippAddUUIDStringFromAttribute(PropertyDictionary& dictionary, ipp_attribute
     set(dictionary, key, value->substr(isPrefixed ? kUUIDPrefix.size() : 0));
 }
 
-void ippAddURIStringFromAttribute(PropertyDictionary& dictionary, ipp_attribute_t* attribute, std::string_view host,
-                                  std::int32_t port, std::string_view key, Log& log) {
+void ippAddURIStringFromAttribute(PropertyDictionary& dictionary, ipp_attribute_t* attribute,
+                                  std::string_view host, std::int32_t port, std::string_view key, Log& log) {
     const auto value = firstText(attribute);
     if (!value)
         return;
@@ -115,24 +118,24 @@ void ippAddURIStringFromAttribute(PropertyDictionary& dictionary, ipp_attribute_
     std::array<char, 256> user{}, parsedHost{}, resource{};
     int parsedPort = 0;
     const auto status = httpSeparateURI(HTTP_URI_CODING_ALL, value->c_str(), scheme.data(), scheme.size(),
-                                        user.data(), user.size(), parsedHost.data(), parsedHost.size(), &parsedPort,
-                                        resource.data(), resource.size());
+                                        user.data(), user.size(), parsedHost.data(), parsedHost.size(),
+                                        &parsedPort, resource.data(), resource.size());
     if (status != HTTP_URI_STATUS_OK && status != HTTP_URI_STATUS_MISSING_RESOURCE)
         return;
     const std::string hostName(host);
     if (!host.empty() && TextScan::findIgnoringCase(parsedHost.data(), host) == std::string_view::npos) {
-        log.error("Attr:printer-more-info incorrect host ('" + std::string(parsedHost.data()) + "', must contain " +
-                  hostName + ") - Unsupported adminURL\n");
+        log.error("Attr:printer-more-info incorrect host ('" + std::string(parsedHost.data()) +
+                  "', must contain " + hostName + ") - Unsupported adminURL\n");
         return;
     }
     if (parsedPort != port) {
-        log.error("Attr:printer-more-info incorrect port number (" + std::to_string(parsedPort) + ", must be " +
-                  std::to_string(port) + ") - Unsupported adminURL\n");
+        log.error("Attr:printer-more-info incorrect port number (" + std::to_string(parsedPort) +
+                  ", must be " + std::to_string(port) + ") - Unsupported adminURL\n");
         return;
     }
     std::array<char, 1024> uri{};
-    if (httpAssembleURI(HTTP_URI_CODING_ALL, uri.data(), uri.size(), scheme.data(), nullptr, hostName.c_str(), port,
-                        resource.data()) == HTTP_URI_STATUS_OK)
+    if (httpAssembleURI(HTTP_URI_CODING_ALL, uri.data(), uri.size(), scheme.data(), nullptr, hostName.c_str(),
+                        port, resource.data()) == HTTP_URI_STATUS_OK)
         set(dictionary, key, uri.data());
 }
 
@@ -149,7 +152,8 @@ void ippAddPaperMaxFromAttribute(PropertyDictionary& dictionary, ipp_attribute_t
     set(dictionary, "PaperMax", paperMax(width, length));
 }
 
-void ippAddBooleanFromAttribte(PropertyDictionary& dictionary, ipp_attribute_t* attribute, std::string_view key) {
+void ippAddBooleanFromAttribte(PropertyDictionary& dictionary, ipp_attribute_t* attribute,
+                               std::string_view key) {
     if (ippGetCount(attribute) >= 1)
         setBoolean(dictionary, key, ippGetBoolean(attribute, 0) != 0);
 }

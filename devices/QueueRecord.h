@@ -7,8 +7,8 @@
 
 namespace ventras {
 
-/// One existing queue of the local print server. The scheduler's records are complete; those of the saved list
-/// are taken as they stand.
+/// One existing queue of the local print server. The scheduler's records are complete; those of the saved
+/// list are taken as they stand.
 struct QueueRecord {
     std::optional<std::string> printerName;   ///< "printer-name"
     std::optional<std::string> deviceURI;     ///< "device-uri": where the queue prints to

@@ -20,8 +20,8 @@ DeviceDescription dictionaryFromTXTRecord(std::string_view record) {
         std::array<char, 256> key{};
         std::uint8_t valueLength = 0;
         const void* value = nullptr;
-        if (TXTRecordGetItemAtIndex(length, record.data(), index, key.size(), key.data(), &valueLength, &value) !=
-            kDNSServiceErr_NoError)
+        if (TXTRecordGetItemAtIndex(length, record.data(), index, key.size(), key.data(), &valueLength,
+                                    &value) != kDNSServiceErr_NoError)
             break;
         if (value == nullptr || valueLength == 0)
             continue;

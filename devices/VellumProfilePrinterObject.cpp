@@ -17,11 +17,18 @@
 namespace ventras {
 namespace {
 
-// The two modes are part of the request that printers are known to answer well; the description does not keep them.
+// The two modes are part of the request that printers are known to answer well; the description does not keep
+// them.
 constexpr std::array kRequestedAttributes{
-    "document-format-supported", "output-mode-supported",     "print-color-mode-supported",
-    "printer-dns-sd-name",       "printer-location",          "printer-make-and-model",
-    "printer-uuid",              "sides-supported",           "urf-supported",
+    "document-format-supported",
+    "output-mode-supported",
+    "print-color-mode-supported",
+    "printer-dns-sd-name",
+    "printer-location",
+    "printer-make-and-model",
+    "printer-uuid",
+    "sides-supported",
+    "urf-supported",
 };
 
 using AddOperation = void (*)(PropertyDictionary&, ipp_attribute_t*, std::string_view);
@@ -39,10 +46,13 @@ struct KeptAttribute {
 };
 
 constexpr std::array kKeptAttributes{
-    KeptAttribute{"document-format-supported", IPP_TAG_MIMETYPE, IPPAdditions::ippAddStringsFromAttribute, "pdl"},
-    KeptAttribute{"printer-dns-sd-name", IPP_TAG_NAME, IPPAdditions::ippAddStringFromAttribute, "display-name"},
+    KeptAttribute{"document-format-supported", IPP_TAG_MIMETYPE, IPPAdditions::ippAddStringsFromAttribute,
+                  "pdl"},
+    KeptAttribute{"printer-dns-sd-name", IPP_TAG_NAME, IPPAdditions::ippAddStringFromAttribute,
+                  "display-name"},
     KeptAttribute{"printer-location", IPP_TAG_TEXT, IPPAdditions::ippAddStringFromAttribute, "note"},
-    KeptAttribute{"printer-make-and-model", IPP_TAG_TEXT, IPPAdditions::ippAddProductFromAttribute, "product"},
+    KeptAttribute{"printer-make-and-model", IPP_TAG_TEXT, IPPAdditions::ippAddProductFromAttribute,
+                  "product"},
     KeptAttribute{"printer-uuid", IPP_TAG_URI, IPPAdditions::ippAddUUIDStringFromAttribute, "UUID"},
     KeptAttribute{"urf-supported", IPP_TAG_KEYWORD, IPPAdditions::ippAddStringsFromAttribute, "URF"},
     KeptAttribute{"sides-supported", IPP_TAG_KEYWORD, addDuplex, "Duplex"},
@@ -113,8 +123,8 @@ void VellumProfilePrinterObject::updateAttributes() {
     auto connection = IppConnection::toPrinter(host, port, cupsEncryption());
     if (!connection.connected()) {
         failure_ = "it cannot be reached: " + connection.failure();
-        platform_.log.error("-[VellumProfilePrinterObject updateAttributes]: Unable to connect to " + host + ":" +
-                            std::to_string(port) + ": " + connection.failure());
+        platform_.log.error("-[VellumProfilePrinterObject updateAttributes]: Unable to connect to " + host +
+                            ":" + std::to_string(port) + ": " + connection.failure());
         return;
     }
     const auto answer = connection.exchange(descriptionRequest(uri), resource);

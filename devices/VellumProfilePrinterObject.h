@@ -15,8 +15,8 @@ struct Platform;
 
 /// A network printer named by an "ipp://" or "ipps://" URI, which needs no driver of its own.
 ///
-/// It asks the printer at most once for its description, with one IPP Get-Printer-Attributes request (RFC 8011
-/// section 4.2.5), when the description is first needed. One thread at a time.
+/// It asks the printer at most once for its description, with one IPP Get-Printer-Attributes request (RFC
+/// 8011 section 4.2.5), when the description is first needed. One thread at a time.
 class VellumProfilePrinterObject final : public VentrasPrinterObject {
 public:
     static constexpr std::string_view kBrowserIdentifier = "Vellum Profile";
@@ -28,7 +28,8 @@ public:
 
     const std::optional<std::string>& uri() const { return uri_; }
 
-    /// The printer's description; asks the printer when there is none yet. Empty when the printer did not answer.
+    /// The printer's description; asks the printer when there is none yet. Empty when the printer did not
+    /// answer.
     const DeviceDescription& attributes();
     void setAttributes(DeviceDescription attributes);
 

@@ -14,8 +14,8 @@ namespace ventras {
 class OperationDelegate;
 struct Platform;
 
-/// Runs after all queue operations of a round, with the devices that found no driver. Its own work is to report.
-/// The list of devices belongs to the main thread.
+/// Runs after all queue operations of a round, with the devices that found no driver. Its own work is to
+/// report. The list of devices belongs to the main thread.
 class DownloadTriggerOperation final : public Operation {
 public:
     static std::shared_ptr<DownloadTriggerOperation> downloadTriggerOperationWithDelegate(

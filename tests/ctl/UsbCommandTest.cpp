@@ -88,7 +88,8 @@ TEST_F(CtlUsb, SaysWhichPackageWouldBeOffered) {
     ASSERT_EQ(explanations.size(), 1U) << explained.standardOutput;
     EXPECT_EQ(json(explanations.front(), "status"), "241") << explained.standardOutput;
     EXPECT_EQ(json(explanations.front(), "driverPackage"), "\"printer-driver-brlaser\"");
-    EXPECT_TRUE(json(explanations.front(), "packageReason").starts_with("\"it is ")) << explained.standardOutput;
+    EXPECT_TRUE(json(explanations.front(), "packageReason").starts_with("\"it is "))
+        << explained.standardOutput;
 }
 
 }  // namespace

@@ -7,11 +7,17 @@ namespace ventras {
 /// A USB with nothing attached.
 class EmptyUsbRegistry final : public UsbRegistry {
 public:
-    std::unique_ptr<UsbInterfaceIterator> matchingInterfaces(const UsbInterfaceMatch&) override { return nullptr; }
-    std::unique_ptr<UsbInterfaceIterator> interfacesOfDevice(const UsbDeviceHandle&) override { return nullptr; }
+    std::unique_ptr<UsbInterfaceIterator> matchingInterfaces(const UsbInterfaceMatch&) override {
+        return nullptr;
+    }
+    std::unique_ptr<UsbInterfaceIterator> interfacesOfDevice(const UsbDeviceHandle&) override {
+        return nullptr;
+    }
     std::unique_ptr<UsbInterfaceService> nextInterface(UsbInterfaceIterator&) override { return nullptr; }
     std::unique_ptr<UsbInterfaceHandle> openInterface(const UsbInterfaceService&) override { return nullptr; }
-    std::unique_ptr<UsbDeviceService> deviceOfInterface(const UsbInterfaceHandle&) override { return nullptr; }
+    std::unique_ptr<UsbDeviceService> deviceOfInterface(const UsbInterfaceHandle&) override {
+        return nullptr;
+    }
     std::unique_ptr<UsbDeviceHandle> openDevice(const UsbDeviceService&) override { return nullptr; }
     std::optional<std::uint32_t> interfaceLocation(const UsbInterfaceHandle&) override { return {}; }
     std::optional<std::uint8_t> interfaceNumber(const UsbInterfaceHandle&) override { return {}; }
@@ -26,7 +32,9 @@ public:
                                                           const UsbInterfaceDescriptor*) override {
         return nullptr;
     }
-    UsbStatus controlRequest(const UsbInterfaceHandle&, UsbControlRequest&) override { return UsbStatus::kNoDevice; }
+    UsbStatus controlRequest(const UsbInterfaceHandle&, UsbControlRequest&) override {
+        return UsbStatus::kNoDevice;
+    }
 };
 
 }  // namespace ventras

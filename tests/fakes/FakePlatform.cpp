@@ -40,7 +40,8 @@ std::optional<pid_t> FakeProcessTable::processNamed(std::string_view commandName
     return process == processes.end() ? std::nullopt : std::optional{process->second};
 }
 
-std::optional<std::string> FakeResources::pathForResource(std::string_view resource, std::string_view type) const {
+std::optional<std::string> FakeResources::pathForResource(std::string_view resource,
+                                                          std::string_view type) const {
     const auto path = folder / (std::string(resource) + "." + std::string(type));
     return std::filesystem::exists(path) ? std::optional{path.string()} : std::nullopt;
 }
@@ -88,7 +89,8 @@ FakePlatform::FakePlatform(UsbRegistry* usb)
                .printToolAgent = printToolAgent,
                .installer = installer,
                .usb = usb != nullptr ? *usb : emptyUsb,
-               .makeImageDeviceBrowser = [this] { return std::make_unique<FakeImageDeviceBrowser>(imageDevices); }} {
-}
+               .makeImageDeviceBrowser = [this] {
+                   return std::make_unique<FakeImageDeviceBrowser>(imageDevices);
+               }} {}
 
 }  // namespace ventras

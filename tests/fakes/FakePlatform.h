@@ -120,7 +120,9 @@ public:
     void setDelegate(PredicateInstallDelegate* newDelegate) override { delegate = newDelegate; }
     void configure(const PredicateInstallSettings& newSettings) override { settings = newSettings; }
     void setTitle(const std::string& newTitle) override { title = newTitle; }
-    void setInstalledPrintersList(const PropertyDictionary& printers) override { installedPrinters = printers; }
+    void setInstalledPrintersList(const PropertyDictionary& printers) override {
+        installedPrinters = printers;
+    }
     void startWithPredicate(const std::string& predicate, bool confirm) override;
 };
 

@@ -222,7 +222,8 @@ TEST_F(IppUsbPrinter, KeepsJobsWhileItIsAwayAndPrintsThemWhenItIsBackAtAnotherPo
     EXPECT_TRUE(becomes(queue, "printer-state-reasons", "none"));
 }
 
-// Without the printer's own description there is no driver, and a queue without one would send anything as it is.
+// Without the printer's own description there is no driver, and a queue without one would send anything as it
+// is.
 TEST_F(IppUsbPrinter, GetsNoQueueWhileItIsRegisteredButDoesNotAnswer) {
     auto gone = service();
     gone.port = freePort();

@@ -6,9 +6,9 @@
 
 namespace ventras {
 
-/// The interpreter of a PostScript printer: a real Ghostscript, one run for each job that arrives. It works beside
-/// the USB, as a printer's does: what it prints can be fetched when it is there. For FakePrinter::interpreter; copies
-/// are the same interpreter. One thread at a time.
+/// The interpreter of a PostScript printer: a real Ghostscript, one run for each job that arrives. It works
+/// beside the USB, as a printer's does: what it prints can be fetched when it is there. For
+/// FakePrinter::interpreter; copies are the same interpreter. One thread at a time.
 class PostScriptInterpreter {
 public:
     /// @param prologue PostScript that makes the interpreter the printer's, run before each job

@@ -17,7 +17,9 @@ using testing::HasSubstr;
 const std::string kUUID = "0f1e2d3c-4b5a-6978-8796-a5b4c3d2e1f0";
 
 ScriptedPrinterOptions multifunctionPrinter() {
-    return {.edit = [](ipp_t* answer) { setAttribute(answer, IPP_TAG_URI, "printer-uuid", "urn:uuid:" + kUUID); }};
+    return {.edit = [](ipp_t* answer) {
+        setAttribute(answer, IPP_TAG_URI, "printer-uuid", "urn:uuid:" + kUUID);
+    }};
 }
 
 Environment withBus(Environment environment) {
@@ -25,8 +27,8 @@ Environment withBus(Environment environment) {
     return environment;
 }
 
-// Scanners of this very computer are watched for when a printer of that kind is named; the one named here does not
-// exist, and takes the time in which the scanner is found.
+// Scanners of this very computer are watched for when a printer of that kind is named; the one named here
+// does not exist, and takes the time in which the scanner is found.
 TEST(NetworkPrinter, IsJoinedWithItsScannerByTheirUUID) {
     PrivateResponder responder;
     PublishedService scanner;
@@ -42,7 +44,8 @@ TEST(NetworkPrinter, IsJoinedWithItsScannerByTheirUUID) {
     const auto run = agent.run(arguments);
     ASSERT_EQ(run.queueIDs().size(), 1U) << run.story();
     const auto queues = scheduler.queues();
-    EXPECT_THAT(scheduler.ppd(run.queueID()), HasSubstr("*QLScannerUUID: \"" + kUUID + "\"\n")) << run.story();
+    EXPECT_THAT(scheduler.ppd(run.queueID()), HasSubstr("*QLScannerUUID: \"" + kUUID + "\"\n"))
+        << run.story();
 
     const auto before = stateOfQueues(scheduler, queues);
     agent.run(arguments);

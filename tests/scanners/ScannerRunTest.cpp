@@ -79,13 +79,15 @@ TEST_F(ScannerRun, TakesBothSpellingsOfTheOption) {
 }
 
 TEST_F(ScannerRun, HasNoDeviceForADescriptionThatIsNone) {
-    for (const auto* argument : {"--scanner", "-s", "--scannerU,P,N,/i,USB,1,2", "--scannerU,P,N,/i,TCP/IP,x"})
+    for (const auto* argument :
+         {"--scanner", "-s", "--scannerU,P,N,/i,USB,1,2", "--scannerU,P,N,/i,TCP/IP,x"})
         EXPECT_EQ(agent_.run({argument}).exitStatus, 255) << argument;
     EXPECT_THAT(scheduler_.queues(), IsEmpty());
 }
 
 TEST_F(ScannerRun, RefusesADescriptionThatWouldSmuggleInAFilter) {
-    const auto run = agent_.run({"--scannerU-1,P,A\"\n*cupsFilter: \"application/pdf 0 evil\"\n*X: \",/i,USB,1,2,3"});
+    const auto run =
+        agent_.run({"--scannerU-1,P,A\"\n*cupsFilter: \"application/pdf 0 evil\"\n*X: \",/i,USB,1,2,3"});
     EXPECT_EQ(run.exitStatus, 65) << run.story();
     EXPECT_THAT(run.standardError, HasSubstr("usb://U-1"));
     EXPECT_THAT(scheduler_.queues(), IsEmpty());
@@ -98,7 +100,8 @@ TEST_F(ScannerRun, RecordsTheScannerOfAPrinterThatItSetsUp) {
     ASSERT_EQ(run.exitStatus, 0) << run.story();
     const auto ppd = scheduler_.ppd(run.queueID());
     EXPECT_THAT(ppd, HasSubstr("\n*QLScannerUUID: \""));
-    EXPECT_THAT(ppd, HasSubstr("\n*QLScannerModulePath: \"" + (modules_ / "libsane-acme.so.1").string() + "\"\n"));
+    EXPECT_THAT(ppd,
+                HasSubstr("\n*QLScannerModulePath: \"" + (modules_ / "libsane-acme.so.1").string() + "\"\n"));
     EXPECT_TRUE(ppd.ends_with("*QLICADriver: \"True\"\n\n")) << ppd;
 
     const auto before = stateOfQueues(scheduler_, scheduler_.queues());

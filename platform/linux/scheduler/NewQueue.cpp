@@ -76,7 +76,8 @@ std::optional<Refusal> objectionTo(const NewQueue& queue) {
         return badData("no queue is made for this kind of device URI");
     // What drives an IPP-over-USB printer is made from its own answer.
     if (queue.ppdPath.empty())
-        return Refusal{PrintSystemStatus::kUnavailable, "the printer did not tell what its driver has to know"};
+        return Refusal{PrintSystemStatus::kUnavailable,
+                       "the printer did not tell what its driver has to know"};
     return std::nullopt;
 }
 
