@@ -8,11 +8,13 @@
 namespace ventras {
 namespace {
 
+using namespace PrintToolAgentKeys;
+
 // Longer than any device ID: IEEE 1284 tells its length in 16 bits.
 constexpr std::size_t kLongestScanID = 65536;
 
 PackageScope scopeOf(const PropertyDictionary& arguments) {
-    const auto vellum = arguments.find("Vellum");
+    const auto vellum = arguments.find(kVellum);
     const auto* flag = vellum == arguments.end() ? nullptr : std::get_if<bool>(&vellum->second);
     return flag != nullptr && *flag ? PackageScope::AlsoDriverless : PackageScope::DeviceDrivers;
 }
@@ -40,18 +42,18 @@ const DriverCatalogue* CatalogueAgent::catalogue() {
 
 std::optional<PropertyDictionary> CatalogueAgent::answer(std::uint32_t command,
                                                          const PropertyDictionary& arguments) {
-    const auto* scanID = findText(arguments, "scanID");
+    const auto* scanID = findText(arguments, kScanID);
     if (command != PrintToolAgentChannel::kCountDriverPackages || scanID == nullptr ||
         scanID->size() > kLongestScanID)
         return std::nullopt;
     const auto* known = catalogue();
     if (known == nullptr)
-        return PropertyDictionary{{"count", std::int64_t{0}}, {"is_cache_current", false}};
+        return PropertyDictionary{{kCount, std::int64_t{0}}, {kIsCacheCurrent, false}};
     const auto packages = known->packagesFor(*scanID, scopeOf(arguments));
-    PropertyDictionary reply{{"count", static_cast<std::int64_t>(packages.size())},
-                             {"is_cache_current", known->release() == thisRelease_}};
+    PropertyDictionary reply{{kCount, static_cast<std::int64_t>(packages.size())},
+                             {kIsCacheCurrent, known->release() == thisRelease_}};
     if (packages.size() > 1)
-        reply.emplace("conflicts", namesOf(packages));
+        reply.emplace(kConflicts, namesOf(packages));
     return reply;
 }
 

@@ -42,6 +42,9 @@ public:
     /// Has all packages, without being in their lists of tags.
     static constexpr std::string_view kPrintingSoftware = "printing software";
 
+    /// Name of the catalogue's file among the program's data.
+    static constexpr const char* kFileName = "driver-packages.plist";
+
     /// Reads a catalogue file (docs/driver-catalogue.md).
     static CatalogueReading read(const std::filesystem::path& path);
 

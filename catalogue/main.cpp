@@ -42,7 +42,7 @@ int main(int argc, char** argv) {
         return kUsage;
     }
     Syslog log;
-    CatalogueAgent agent(locateDataFolder() / "driver-packages.plist", thisRelease(), log);
+    CatalogueAgent agent(locateDataFolder() / DriverCatalogue::kFileName, thisRelease(), log);
     if (AgentService(agent).run(*limit))
         return 0;
     log.error("driver packages cannot be looked up: the session bus is not there, or is served already");

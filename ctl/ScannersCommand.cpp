@@ -20,7 +20,8 @@ namespace {
 constexpr std::chrono::seconds kListeningTime{3};
 
 // All that the agent ever looks for: scanners at this computer and those of IPP-over-USB printers.
-constexpr std::uint64_t kDeviceTypes = 258 | 0xfe00;
+constexpr auto kDeviceTypes =
+    ImageDeviceTypes::kScanners | ImageDeviceTypes::kReachable | ImageDeviceTypes::kRegisteredHere;
 
 constexpr std::array kColumns{
     Column{"transport", translatable("TRANSPORT")}, Column{"uuidString", translatable("UUID")},

@@ -21,9 +21,6 @@
 namespace ventras::PPDFiles {
 namespace {
 
-/// The largest PPDs have a few megabytes; a small gzip file may well unfold to more than the disk holds.
-constexpr std::size_t kLargestPPD = 64 << 20;
-
 // Names that the scheduler reports relative to the root folder.
 constexpr std::array<std::string_view, 2> kInstalledFolders{"Library/Printers",
                                                             "System/Library/Printers/PPDs"};
@@ -51,6 +48,7 @@ std::optional<std::size_t> copyBlocks(cups_file_t* source, cups_file_t* copy) {
         if (bytes <= 0)
             break;
         copied += static_cast<std::size_t>(bytes);
+        // A small gzip file may well unfold to more than the disk holds.
         if (copied > kLargestPPD ||
             cupsFileWrite(copy, block.data(), static_cast<std::size_t>(bytes)) < bytes)
             return std::nullopt;

@@ -16,11 +16,12 @@ std::optional<PropertyValue> valueIn(const PropertyDictionary& dictionary, std::
     return entry == dictionary.end() ? std::nullopt : std::optional(entry->second);
 }
 
-/// "key:value" after an optional first component; absent when a value is.
+/// "key:value"; absent when the value is.
 Text component(std::string_view key, const Text& value) {
     return value ? Text(std::string(key) + ":" + *value) : std::nullopt;
 }
 
+/// Two components of a device ID; absent when one of them is.
 Text components(const Text& first, const Text& second) {
     return first && second ? Text(*first + ";" + *second) : std::nullopt;
 }
@@ -60,16 +61,16 @@ std::vector<Text> identitiesOf(const PPDValues& ppd) {
 std::optional<PPDRecord> forDevice(PrintToolAgentChannel& agent, const Text& deviceID, bool vellum) {
     if (!deviceID)
         return std::nullopt;
-    const auto reply =
-        agent.sendCommandSync(PrintToolAgentChannel::kService, PrintToolAgentChannel::kCountDriverPackages,
-                              {{"scanID", *deviceID}, {"Vellum", vellum}});
+    const auto reply = agent.sendCommandSync(
+        PrintToolAgentChannel::kService, PrintToolAgentChannel::kCountDriverPackages,
+        {{PrintToolAgentKeys::kScanID, *deviceID}, {PrintToolAgentKeys::kVellum, vellum}});
     if (packageCount(reply) != 1)
         return std::nullopt;
 
     PPDRecord record;
     record.suDriverPredicate = *deviceID;
-    record.suDriverConflicts = valueIn(reply.dictionary, "conflicts");
-    record.suCacheCurrent = valueIn(reply.dictionary, "is_cache_current");
+    record.suDriverConflicts = valueIn(reply.dictionary, PrintToolAgentKeys::kConflicts);
+    record.suCacheCurrent = valueIn(reply.dictionary, PrintToolAgentKeys::kIsCacheCurrent);
     return record;
 }
 

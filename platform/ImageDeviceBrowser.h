@@ -16,6 +16,14 @@ inline constexpr std::string_view kTCPIP = "TCP/IP";
 inline constexpr std::string_view kBluetooth = "Bluetooth";
 }  // namespace ImageDeviceTransport
 
+/// Bits of the kinds of devices that are looked for.
+namespace ImageDeviceTypes {
+inline constexpr std::uint64_t kScanners = 0x2;
+inline constexpr std::uint64_t kReachable = 0x100;  ///< those that this computer reaches by itself
+/// Also those that are registered on this very computer, as the scanners of IPP-over-USB devices are.
+inline constexpr std::uint64_t kRegisteredHere = 0xfe00;
+}  // namespace ImageDeviceTypes
+
 /// One scanner or multifunction device that the image-capture system announces.
 struct ImageDevice {
     std::string transport;          ///< one of ImageDeviceTransport
@@ -44,7 +52,7 @@ public:
     /// @param delegate not owned; outlives the browser or is replaced by null
     virtual void setDelegate(Delegate* delegate) = 0;
 
-    /// The kinds of devices to look for, a bit set.
+    /// The kinds of devices to look for: a set of ImageDeviceTypes.
     virtual void setBrowsedDeviceTypeMask(std::uint64_t mask) = 0;
     virtual std::uint64_t browsedDeviceTypeMask() const = 0;
 

@@ -31,6 +31,12 @@ struct PredicateInstallSettings {
     bool requiresLicenceAgreement = false;
 };
 
+/// Keys of what the installer is told of the printers that software is wanted for; both are arrays of texts.
+namespace InstalledPrintersKeys {
+inline constexpr const char* kPrinters = "InstalledPrinters";  ///< "MANUFACTURER:make;MODEL:model" of each
+inline constexpr const char* kManufacturers = "Manufacturers";
+}  // namespace InstalledPrintersKeys
+
 /// Offers the software-update packages whose tags match a predicate, and installs them. Main thread only.
 class PredicateInstallController {
 public:
@@ -40,6 +46,7 @@ public:
     virtual void setDelegate(PredicateInstallDelegate* delegate) = 0;
     virtual void configure(const PredicateInstallSettings& settings) = 0;
     virtual void setTitle(const std::string& title) = 0;
+    /// @param printers by InstalledPrintersKeys
     virtual void setInstalledPrintersList(const PropertyDictionary& printers) = 0;
 
     /// Asks the user and installs; returns at once, the delegate hears the end.

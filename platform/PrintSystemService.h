@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
 #include <map>
 #include <memory>
@@ -19,17 +20,22 @@ inline constexpr std::int32_t kCannotCreate = 73;  ///< the scheduler refused th
 inline constexpr std::int32_t kNoPermission = 77;  ///< the scheduler does not let this user administer it
 }  // namespace PrintSystemStatus
 
+/// Longest PPD that is taken for a driver, in bytes. The largest that there are have a few megabytes.
+inline constexpr std::size_t kLargestPPD = std::size_t{16} * 1024 * 1024;
+
 /// What auto-selection learnt about a device.
 struct AutoSelectInfo {
-    std::optional<std::string>
-        product{};            ///< the device's own product text, e.g. a PostScript product string
-    bool isBinaryOK = false;  ///< whether the channel takes binary data
+    std::optional<std::string> product{};  ///< the device's own text, e.g. a PostScript product string
+    bool isBinaryOK = false;               ///< whether the channel takes binary data
 };
 
 /// One device being asked which driver and which installable options suit it; released with the object.
 /// Use it on one thread.
 class AutoSelectContext {
 public:
+    /// A generic PPD whose file name ends so is for the device's fax service, and so is the new one.
+    static constexpr std::string_view kFaxPPDEnding = "VellumFax.ppd";
+
     virtual ~AutoSelectContext() = default;
 
     /// Asks the device what it is. @return 0 on success.

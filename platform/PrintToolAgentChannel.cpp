@@ -5,7 +5,7 @@
 namespace ventras {
 
 std::int64_t packageCount(const PrintToolAgentReply& reply) {
-    const auto count = reply.dictionary.find("count");
+    const auto count = reply.dictionary.find(PrintToolAgentKeys::kCount);
     if (reply.status != 0 || count == reply.dictionary.end())
         return 0;
     if (const auto* number = std::get_if<std::int64_t>(&count->second))

@@ -8,13 +8,11 @@
 #include "devices/IPPUSBObject.h"
 #include "platform/ComputerName.h"
 #include "platform/Platform.h"
+#include "platform/PrintSystemService.h"
 #include "queues/QueueMaker.h"
 
 namespace ventras {
 namespace {
-
-// The print system makes a fax PPD from a generic PPD of this name.
-constexpr const char* kFaxPPDEnding = "VellumFax.ppd";
 
 // The new name can be foreseen by whoever sees the old one, so nothing that is there already is written to,
 // followed or replaced.
@@ -37,7 +35,7 @@ std::int32_t QueueMaker::createQueue(IPPUSBObject& printer) {
 
 // The printer queue is there already: whatever becomes of the fax queue changes nothing about that.
 void QueueMaker::createFaxQueue(IPPUSBObject& printer, QueueAttributes attributes, TemporaryFile ppd) {
-    const std::string faxPath = ppd.path() + kFaxPPDEnding;
+    const auto faxPath = ppd.path() + std::string(AutoSelectContext::kFaxPPDEnding);
     const auto faxPPD = movedToNewName(std::move(ppd), faxPath);
     if (!faxPPD)
         return;

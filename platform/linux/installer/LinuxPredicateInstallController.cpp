@@ -5,6 +5,7 @@
 #include <utility>
 #include <vector>
 
+#include "catalogue/DriverCatalogue.h"
 #include "deviceid/PMStringAdditions.h"
 #include "platform/Log.h"
 #include "platform/linux/DataFolder.h"
@@ -17,9 +18,6 @@
 namespace ventras {
 namespace {
 
-constexpr const char* kCatalogue = "driver-packages.plist";
-constexpr const char* kPrinters = "InstalledPrinters";
-
 std::unique_ptr<Prompter> usualPrompter(EventContext& events) {
     std::vector<std::unique_ptr<Prompter>> prompters;
     prompters.push_back(std::make_unique<NotificationPrompter>(events));
@@ -30,7 +28,7 @@ std::unique_ptr<Prompter> usualPrompter(EventContext& events) {
 
 std::vector<std::string> deviceNames(const PropertyDictionary& printers) {
     std::vector<std::string> names;
-    const auto entry = printers.find(kPrinters);
+    const auto entry = printers.find(InstalledPrintersKeys::kPrinters);
     const auto* scanIDs = entry == printers.end() ? nullptr : std::get_if<PropertyArray>(&entry->second);
     if (scanIDs == nullptr)
         return names;
@@ -76,7 +74,7 @@ InstallEnd LinuxPredicateInstallController::install(const InstallRequest& reques
                                                     const std::stop_token& stop) const {
     EventContext events(stop);
     const auto prompter = parts_.makePrompter ? parts_.makePrompter(events) : usualPrompter(events);
-    auto catalogue = parts_.catalogue ? *parts_.catalogue : locateDataFolder() / kCatalogue;
+    auto catalogue = parts_.catalogue ? *parts_.catalogue : locateDataFolder() / DriverCatalogue::kFileName;
     PackageInstaller installer(std::move(catalogue), strings_, *prompter, events,
                                parts_.limits ? *parts_.limits : InstallLimits{});
     auto end = installer.install(request);

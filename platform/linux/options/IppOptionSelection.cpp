@@ -13,8 +13,8 @@ namespace ventras {
 namespace {
 
 PrinterService serviceFor(const std::string& ppdPath) {
-    return ppdPath.ends_with(IppOptionSelection::kFaxDriverEnding) ? PrinterService::FaxOut
-                                                                   : PrinterService::Print;
+    return ppdPath.ends_with(AutoSelectContext::kFaxPPDEnding) ? PrinterService::FaxOut
+                                                               : PrinterService::Print;
 }
 
 IppAnswer askForDescription(const PrinterAddress& address) {

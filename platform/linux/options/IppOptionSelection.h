@@ -15,9 +15,6 @@ class Log;
 /// sensibly, leaves the PPD as it is; that is no failure. Use it on one thread.
 class IppOptionSelection : public AutoSelectContext {
 public:
-    /// Generic drivers with this ending of their file's name are for the printer's fax service.
-    static constexpr std::string_view kFaxDriverEnding = "VellumFax.ppd";
-
     /// @param log outlives the context
     IppOptionSelection(std::string deviceURI, Log& log) : deviceURI_(std::move(deviceURI)), log_(log) {}
 

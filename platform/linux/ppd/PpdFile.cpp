@@ -11,10 +11,11 @@
 #include <optional>
 #include <system_error>
 
+#include "platform/PrintSystemService.h"
+
 namespace ventras {
 namespace {
 
-constexpr off_t kLargestPpd = off_t{16} * 1024 * 1024;
 constexpr std::string_view kBlanks = " \t";
 
 std::string_view nextWord(std::string_view& text) {
@@ -83,7 +84,7 @@ PpdFile PpdFile::open(const std::string& path) {
         ppd.defect_ = "the PPD is no regular file";
     else if (status.st_size == 0)
         ppd.defect_ = "the PPD is empty";
-    else if (status.st_size > kLargestPpd)
+    else if (status.st_size > static_cast<off_t>(kLargestPPD))
         ppd.defect_ = "the PPD is too large";
     else
         ppd.read();

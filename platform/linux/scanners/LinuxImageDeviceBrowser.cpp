@@ -3,24 +3,18 @@
 #include <algorithm>
 
 namespace ventras {
-namespace {
-
-constexpr std::uint64_t kScanners = 0x2;
-constexpr std::uint64_t kReachable = 0x100;
-constexpr std::uint64_t kRegisteredHere = 0xfe00;
-
-}  // namespace
 
 LinuxImageDeviceBrowser::LinuxImageDeviceBrowser() : events_([this] { handleEvents(); }) {}
 
 void LinuxImageDeviceBrowser::start() {
-    if ((mask_ & kScanners) == 0 || (mask_ & kReachable) == 0)
+    constexpr auto kNeeded = ImageDeviceTypes::kScanners | ImageDeviceTypes::kReachable;
+    if ((mask_ & kNeeded) != kNeeded)
         return;
     const auto post = [this](ScannerEvent event) { events_.post(std::move(event)); };
     usb_.emplace(post);
-    network_.emplace(
-        (mask_ & kRegisteredHere) != 0 ? ScannerServices::AlsoOfThisComputer : ScannerServices::OfTheNetwork,
-        post);
+    network_.emplace((mask_ & ImageDeviceTypes::kRegisteredHere) != 0 ? ScannerServices::AlsoOfThisComputer
+                                                                      : ScannerServices::OfTheNetwork,
+                     post);
 }
 
 std::vector<ImageDevice> LinuxImageDeviceBrowser::devices() const {

@@ -14,9 +14,8 @@ namespace ventras {
 
 /// Scanners on the USB and on the network, as udev and DNS-SD announce them.
 ///
-/// The type mask's bit 0x2 asks for scanners; 0x100 for those that this computer reaches by itself; 0xfe00
-/// also for those that are registered on this very computer, as the scanners of IPP-over-USB devices are.
-/// Starting and stopping take milliseconds. Main thread only.
+/// Without both kScanners and kReachable in the type mask it looks for nothing. Starting and stopping take
+/// milliseconds. Main thread only.
 class LinuxImageDeviceBrowser final : public ImageDeviceBrowser {
 public:
     LinuxImageDeviceBrowser();
