@@ -1,5 +1,7 @@
-# What nearly every file includes, compiled once: half of the time of a build without optimisation goes there. Only where
-# a preset asks for it, so that the others show that each file includes what it uses.
+# What nearly every file includes, compiled once, for half of a build's time goes there: always for the tests, for the rest
+# where a preset asks for it. The others show that each file of the product includes what it uses.
+set(standard_headers <algorithm> <array> <chrono> <cstdint> <filesystem> <fstream> <functional> <map> <memory> <mutex>
+                     <optional> <set> <span> <string> <string_view> <thread> <utility> <variant> <vector>)
 
 # precompile_folders(NAME HEADERS header... FOLDERS folder...): for every C++ target of the folders and below them.
 function(precompile_folders name)
@@ -17,19 +19,10 @@ function(precompile_folders name)
     get_property(targets DIRECTORY ${folder} PROPERTY BUILDSYSTEM_TARGETS)
     foreach(target IN LISTS targets)
       get_target_property(type ${target} TYPE)
-      if(type MATCHES "EXECUTABLE|STATIC_LIBRARY|OBJECT_LIBRARY")
+      if(type MATCHES "EXECUTABLE|STATIC_LIBRARY" AND NOT target STREQUAL name)
         target_precompile_headers(${target} REUSE_FROM ${name})
         target_compile_options(${target} PRIVATE ${shared_options})
       endif()
     endforeach()
   endwhile()
 endfunction()
-
-get_property(folders DIRECTORY ${PROJECT_SOURCE_DIR} PROPERTY SUBDIRECTORIES)
-list(REMOVE_ITEM folders ${PROJECT_SOURCE_DIR}/tests)
-set(standard <algorithm> <array> <chrono> <cstdint> <filesystem> <fstream> <functional> <map> <memory> <mutex> <optional> <set>
-             <span> <string> <string_view> <thread> <utility> <variant> <vector>)
-precompile_folders(precompiled FOLDERS ${folders} HEADERS ${standard})
-if(VENTRAS_TESTS)
-  precompile_folders(precompiled-tests FOLDERS ${PROJECT_SOURCE_DIR}/tests HEADERS ${standard} <gmock/gmock.h> <gtest/gtest.h>)
-endif()
