@@ -7,6 +7,7 @@
 #include <cerrno>
 #include <memory>
 #include <set>
+#include <thread>
 #include <utility>
 
 namespace ventras {
@@ -32,6 +33,13 @@ bool isPrinter(const FakeUsbSetting& setting) {
 }
 
 }  // namespace
+
+UsbSetup UsbSetup::parse(const std::uint8_t* packet) {
+    const auto word = [&](std::size_t at) {
+        return static_cast<std::uint16_t>(packet[at] | packet[at + 1] << 8U);
+    };
+    return {packet[0], packet[1], word(2), word(4), word(6)};
+}
 
 UsbAnswer UsbAnswer::stall() {
     return {EPIPE, {}, {}};
@@ -237,6 +245,16 @@ std::vector<UsbSetup> FakePrinter::requests() const {
 std::string FakePrinter::received() const {
     const std::lock_guard lock(mutex_);
     return received_;
+}
+
+bool FakePrinter::receives(std::string_view text, std::chrono::milliseconds limit) const {
+    const auto deadline = std::chrono::steady_clock::now() + limit;
+    while (received().find(text) == std::string::npos) {
+        if (std::chrono::steady_clock::now() > deadline)
+            return false;
+        std::this_thread::sleep_for(std::chrono::milliseconds(20));
+    }
+    return true;
 }
 
 }  // namespace ventras

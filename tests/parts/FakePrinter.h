@@ -24,6 +24,9 @@ struct UsbSetup {
     std::uint16_t wIndex = 0;
     std::uint16_t wLength = 0;
 
+    /// @param packet its 8 bytes as they go over the bus
+    static UsbSetup parse(const std::uint8_t* packet);
+
     bool operator==(const UsbSetup&) const = default;
 };
 
@@ -95,6 +98,9 @@ public:
 
     std::vector<UsbSetup> requests() const;  ///< every control request so far
     std::string received() const;            ///< everything that reached a bulk endpoint
+
+    /// Waits for a text at a bulk endpoint. @return false when it has not come within `limit`.
+    bool receives(std::string_view text, std::chrono::milliseconds limit = std::chrono::seconds(30)) const;
 
 private:
     UsbAnswer answer(const UsbSetup& setup);

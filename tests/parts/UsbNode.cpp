@@ -13,10 +13,10 @@
 #include <string_view>
 #include <utility>
 
+#include "tests/parts/UsbTransfer.h"
+
 namespace ventras {
 namespace {
-
-using Clock = std::chrono::steady_clock;
 
 // The node of the bench is a plain file, always ready: without a pause its users would spin while they wait.
 constexpr guint kPauseMilliseconds = 5;
@@ -29,13 +29,6 @@ constexpr std::size_t kSetupLength = 8;
 template <class Value>
 Value& valueIn(UMockdevIoctlData* data) {
     return *reinterpret_cast<Value*>(data->data);
-}
-
-UsbSetup setupFrom(const std::uint8_t* packet) {
-    const auto word = [&](std::size_t at) {
-        return static_cast<std::uint16_t>(packet[at] | packet[at + 1] << 8U);
-    };
-    return {packet[0], packet[1], word(2), word(4), word(6)};
 }
 
 struct LateAnswer {
@@ -76,8 +69,7 @@ struct UsbNode::Transfer {
     Client client;
     UMockdevIoctlData* urb;
     UMockdevIoctlData* buffer = nullptr;
-    std::optional<UsbAnswer> answer;
-    Clock::time_point due;
+    std::optional<UsbTransfer> progress;
     bool done = false;
 };
 
@@ -278,51 +270,38 @@ int UsbNode::submit(Client client, UMockdevIoctlData* urb) {
     if (header.buffer_length > 0)
         transfer->buffer = umockdev_ioctl_data_resolve(urb, offsetof(usbdevfs_urb, buffer),
                                                        static_cast<gulong>(header.buffer_length), nullptr);
-    const bool isControl = header.type == USBDEVFS_URB_TYPE_CONTROL;
-    if (isControl) {
-        if (transfer->buffer == nullptr || header.buffer_length < static_cast<int>(kSetupLength))
+    const std::size_t length = static_cast<std::size_t>(header.buffer_length);
+    if (header.type == USBDEVFS_URB_TYPE_CONTROL) {
+        if (transfer->buffer == nullptr || length < kSetupLength)
             return EINVAL;
-        const auto setup = setupFrom(transfer->buffer->data);
+        const auto setup = UsbSetup::parse(transfer->buffer->data);
         if (const int error = refusal(client, setup); error != 0)
             return error;
-        transfer->answer = printer_.control(setup);
+        transfer->progress = UsbTransfer::control(printer_, setup, length - kSetupLength);
     } else if (std::ranges::none_of(claims_, [=](const auto& owned) { return owned.second == client; })) {
         return EBUSY;
-    } else if ((header.endpoint & USB_DIR_IN) == 0) {
+    } else if ((header.endpoint & USB_DIR_IN) != 0) {
+        transfer->progress = UsbTransfer::bulkIn(printer_, header.endpoint, length);
+    } else {
         const auto* bytes =
             transfer->buffer == nullptr ? nullptr : reinterpret_cast<const char*>(transfer->buffer->data);
-        transfer->answer =
-            printer_.bulkOut(header.endpoint, {bytes, static_cast<std::size_t>(header.buffer_length)});
-        if (transfer->answer->error == 0)
-            transfer->answer->data.resize(static_cast<std::size_t>(header.buffer_length));
+        transfer->progress = UsbTransfer::bulkOut(printer_, header.endpoint, {bytes, length});
     }
-    // What the device has taken, or answered, has happened even if nobody waits for it any more.
-    if (transfer->answer) {
-        transfer->due = Clock::now() + transfer->answer->after;
+    // What the device has answered cannot be discarded any more.
+    if (header.type == USBDEVFS_URB_TYPE_CONTROL || (header.endpoint & USB_DIR_IN) == 0)
         advance(*transfer);
-    }
     transfers_.push_back(std::move(transfer));
     return 0;
 }
 
 void UsbNode::advance(Transfer& transfer) {
-    auto& header = transfer.header();
-    const bool isIn = header.type == USBDEVFS_URB_TYPE_CONTROL || (header.endpoint & USB_DIR_IN) != 0;
-    if (!transfer.answer) {
-        transfer.answer = printer_.bulkIn(header.endpoint, static_cast<std::size_t>(header.buffer_length));
-        if (!transfer.answer)
-            return;
-        transfer.due = Clock::now() + transfer.answer->after;
-    }
-    const auto& [error, data, after] = *transfer.answer;
-    if (error == ETIMEDOUT || Clock::now() < transfer.due)
+    const auto outcome = transfer.progress->outcome();
+    if (!outcome)
         return;
-    const std::size_t offset = header.type == USBDEVFS_URB_TYPE_CONTROL ? kSetupLength : 0;
-    const std::size_t room = static_cast<std::size_t>(header.buffer_length) - offset;
-    const auto length = std::min(data.size(), room);
-    if (isIn && transfer.buffer != nullptr)
-        std::copy_n(data.begin(), length, transfer.buffer->data + offset);
-    transfer.finish(data.size() > room ? EOVERFLOW : error, length);
+    const std::size_t offset = transfer.header().type == USBDEVFS_URB_TYPE_CONTROL ? kSetupLength : 0;
+    if (transfer.buffer != nullptr)
+        std::ranges::copy(outcome->data, transfer.buffer->data + offset);
+    transfer.finish(outcome->error, outcome->length);
 }
 
 bool UsbNode::reap(Client client, UMockdevIoctlData* argument) {

@@ -12,7 +12,9 @@
 
 #include "devices/UsbInterfaceReader.h"
 #include "tests/parts/UsbBench.h"
+#include "tests/usb/AttachedPrinters.h"
 #include "tests/usb/FakeUsbRegistry.h"
+#include "tests/usb/FaultyAnswers.h"
 
 namespace ventras {
 namespace {
@@ -24,47 +26,21 @@ using testing::IsEmpty;
 using testing::Optional;
 
 constexpr uid_t kNobody = 65534;
-
-std::vector<std::unique_ptr<UsbInterfaceService>> allPrinters(UsbRegistry& registry) {
-    std::vector<std::unique_ptr<UsbInterfaceService>> services;
-    const auto iterator = registry.matchingInterfaces(kUsbPrinterInterfaces);
-    while (auto service = registry.nextInterface(*iterator))
-        services.push_back(std::move(service));
-    return services;
-}
+constexpr auto kWait = 200ms;
 
 class Libusb : public testing::Test {
 protected:
-    std::unique_ptr<UsbInterfaceHandle> openFirst() {
-        return registry.openInterface(*allPrinters(registry).at(0));
-    }
+    std::unique_ptr<UsbInterfaceHandle> openFirst() { return openFirstPrinter(registry); }
 
     std::optional<std::string> firstDeviceID() {
         return UsbInterfaceReader(registry).readDeviceID(*allPrinters(registry).at(0));
     }
 
-    /// The printers' places and interface numbers.
-    std::vector<std::pair<std::uint32_t, int>> places() {
-        std::vector<std::pair<std::uint32_t, int>> list;
-        for (const auto& service : allPrinters(registry)) {
-            const auto interface = registry.openInterface(*service);
-            list.emplace_back(registry.interfaceLocation(*interface).value(),
-                              registry.interfaceNumber(*interface).value());
-        }
-        return list;
-    }
+    std::vector<std::pair<std::uint32_t, int>> places() { return printerPlaces(registry); }
 
     UsbBench bench;
     LibusbRegistry registry;
 };
-
-UsbControlRequest getDeviceID(std::uint16_t length = 256, std::chrono::milliseconds wait = 200ms) {
-    UsbControlRequest request;
-    request.bmRequestType = 0xA1;
-    request.wLength = length;
-    request.noDataTimeOut = wait;
-    return request;
-}
 
 // Listing -----------------------------------------------------------------------------------------
 
@@ -207,31 +183,12 @@ TEST_F(Libusb, ReadsTheIDOfTheInterfaceThatIsAsked) {
     EXPECT_THAT(reader.readDeviceID(*allPrinters(registry).at(1)), Optional("MFG:Example;MDL:Fax;SN:F;"s));
 }
 
-struct FaultCase {
-    const char* name;
-    UsbAnswer answer;
-    UsbStatus status;
-    std::uint32_t bytes;
-};
-const FaultCase kFaults[] = {
-    {"STALL", UsbAnswer::stall(), UsbStatus::kStall, 0},
-    {"no answer", UsbAnswer::silence(), UsbStatus::kTimeOut, 0},
-    {"overrun", {EOVERFLOW, {0, 9}, {}}, UsbStatus::kOverrun, 0},
-    {"more than asked for", {0, UsbBytes(300, 'x'), {}}, UsbStatus::kOverrun, 0},
-    {"protocol error", {EPROTO, {}, {}}, UsbStatus::kFailed, 0},
-    {"unplugged meanwhile", {ESHUTDOWN, {}, {}}, UsbStatus::kNoDevice, 0},
-    {"nothing", {}, UsbStatus::kSuccess, 0},
-    {"one byte", {0, {1}, {}}, UsbStatus::kSuccess, 1},
-    {"late, but in time", {0, {0, 3, 'x'}, 100ms}, UsbStatus::kSuccess, 3},
-    {"too late", {0, {0, 3, 'x'}, 400ms}, UsbStatus::kTimeOut, 0},
-};
-
 TEST_F(Libusb, TellsHowARequestEnded) {
     auto& printer = bench.plugIn("1-1");
-    for (const auto& fault : kFaults) {
+    for (const auto& fault : faultyAnswers(kWait)) {
         printer.fault = [answer = fault.answer](const UsbSetup&) { return std::optional{answer}; };
         const auto interface = openFirst();
-        auto request = getDeviceID();
+        auto request = getDeviceID(256, kWait);
         EXPECT_EQ(registry.controlRequest(*interface, request), fault.status) << fault.name;
         EXPECT_EQ(request.bytesTransferred, fault.bytes) << fault.name;
         EXPECT_EQ(request.data.size(), 256U) << fault.name;
@@ -275,7 +232,7 @@ TEST_F(Libusb, FindsNoDeviceOnceItIsGone) {
     bench.plugIn("1-1");
     const auto services = allPrinters(registry);
     const auto opened = registry.openInterface(*services.at(0));
-    auto request = getDeviceID();
+    auto request = getDeviceID(256, kWait);
     EXPECT_EQ(registry.controlRequest(*opened, request), UsbStatus::kSuccess);
     bench.unplug("1-1");
     EXPECT_EQ(registry.controlRequest(*opened, request), UsbStatus::kNoDevice);
@@ -304,7 +261,7 @@ int lookAtForbiddenPrinterAsNobody(mode_t mode) {
     const auto interface = registry.openInterface(*services[0]);
     if (registry.interfaceLocation(*interface) != 0x01100000)
         return 4;
-    auto request = getDeviceID();
+    auto request = getDeviceID(256, kWait);
     if (registry.controlRequest(*interface, request) != UsbStatus::kAccessDenied)
         return 5;
     return UsbInterfaceReader(registry).readDeviceID(*services[0]) ? 6 : 0;

@@ -54,30 +54,7 @@ protected:
         std::ofstream(data / "model/Library/Printers/exps9000.ppd") << postScriptPpd();
     }
 
-    /// Replaces the backend that lays jobs down by the system's own, which sees the bench, with the agent's
-    /// in front of it. Nobody but root may run the original; a backend that is closed to others is run as
-    /// root.
-    void useStockBackend() const {
-        const auto backend = scheduler.folder() / "bin/backend/usb";
-        const auto programs = scheduler.folder() / "stock";
-        copyStockUsbBackend(programs / "daemon/stock-usb");
-        std::ofstream script(backend);
-        script << "#!/bin/sh\n";
-        for (const auto& [name, value] : bench.environment())
-            script << "export " << name << "='" << value << "'\n";
-        script << "export CUPS_SERVERBIN=" << programs << "\nexec " << VENTRAS_USB_BACKEND << " \"$@\"\n";
-        fs::permissions(backend, fs::perms{0700});
-    }
-
-    static bool receives(const FakePrinter& printer, std::string_view text) {
-        const auto deadline = std::chrono::steady_clock::now() + 30s;
-        while (printer.received().find(text) == std::string::npos) {
-            if (std::chrono::steady_clock::now() > deadline)
-                return false;
-            std::this_thread::sleep_for(20ms);
-        }
-        return true;
-    }
+    void useStockBackend() const { useStockUsbBackend(scheduler, VENTRAS_USB_BACKEND, bench.environment()); }
 
     static Environment together(Environment one, const Environment& other) {
         one.insert(other.begin(), other.end());
@@ -163,7 +140,7 @@ TEST_F(UsbQueue, PrintsThroughTheStockBackendToThePrinter) {
     ASSERT_EQ(run.exitStatus, 0) << run.story();
     useStockBackend();
     scheduler.print(run.queueID(), "hello.pdf");
-    EXPECT_TRUE(receives(printer, "@PJL EOJ")) << scheduler.errorLog();
+    EXPECT_TRUE(printer.receives("@PJL EOJ")) << scheduler.errorLog();
     EXPECT_THAT(printer.received(), HasSubstr("@PJL ENTER LANGUAGE = PCL"));
 }
 
@@ -189,7 +166,7 @@ TEST_F(UsbQueue, PrintsThoughTheStockBackendKnowsThePrinterByAnotherURI) {
         ASSERT_EQ(run.exitStatus, 0) << run.story();
         EXPECT_EQ(scheduler.attribute(run.queueID(), "device-uri"), queueURI);
         scheduler.print(run.queueID(), "hello.pdf");
-        EXPECT_TRUE(receives(printer, kEndOfPclPage)) << queueURI << '\n' << scheduler.errorLog();
+        EXPECT_TRUE(printer.receives(kEndOfPclPage)) << queueURI << '\n' << scheduler.errorLog();
         bench.unplug("1-4");
     }
 }
@@ -209,7 +186,7 @@ TEST_F(UsbQueue, PrintsToTheRightOneOfTwoPrintersOnceItIsThere) {
     std::this_thread::sleep_for(3s);
     EXPECT_THAT(wrong.received(), IsEmpty());
     auto& right = attach(model, "2-1");
-    EXPECT_TRUE(receives(right, kEndOfPclPage)) << scheduler.errorLog();
+    EXPECT_TRUE(right.receives(kEndOfPclPage)) << scheduler.errorLog();
     EXPECT_THAT(wrong.received(), IsEmpty());
 }
 
