@@ -36,9 +36,8 @@ TEST_F(Packages, AreListedByWhatNeedsThem) {
 
 TEST_F(Packages, AreNamedOnceAndInOrderInEachSection) {
     const auto result = folder_.runWithParts(
-        "for s in build run test package ci; do packages_of $s | LC_ALL=C sort -uc && packages_of $s | grep "
-        "-q .; "
-        "done");
+        "for s in build run test kernel package ci; do packages_of $s | LC_ALL=C sort -uc && "
+        "packages_of $s | grep -q .; done");
     EXPECT_EQ(result.exitStatus, 0) << result.standardError;
 }
 
