@@ -12,6 +12,7 @@
 #include "fuzz/PPDChecks.h"
 #include "fuzz/RecordChecks.h"
 #include "fuzz/Require.h"
+#include "platform/FileContent.h"
 #include "platform/MessageLimits.h"
 #include "platform/PropertyList.h"
 #include "platform/Utf8.h"
@@ -98,7 +99,7 @@ void checkPPD(ipp_t* answer, PrinterService service) {
         require(!std::get<std::string>(made).empty());
         return;
     }
-    const auto text = readFile(file->path());
+    const auto text = fileContent(file->path()).value_or("");
     checkPPDText(text);
     checkStockFilters(text);
     const auto record = parsePPDFile(file->path());

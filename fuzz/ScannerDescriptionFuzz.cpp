@@ -9,6 +9,7 @@
 #include "drivers/PPDManager.h"
 #include "fuzz/PPDChecks.h"
 #include "fuzz/Require.h"
+#include "platform/FileContent.h"
 #include "platform/TemporaryFile.h"
 #include "platform/linux/ppd/DriverRules.h"
 #include "platform/linux/ppd/PpdFile.h"
@@ -47,7 +48,7 @@ void checkOwnQueue(const ScannerObject& scanner) {
     if (objectionToDriver(ppd, DriverKind::ScannerOnly))
         return;
     require(ppd.isScannerOnly());
-    checkNoFilters(readFile(file.path()));
+    checkNoFilters(fileContent(file.path()).value_or(""));
 }
 
 void checkPrintersQueue(const ScannerObject& scanner) {

@@ -1,28 +1,11 @@
 #include "platform/ResponseBody.h"
 
-#include <unistd.h>
-
 #include <algorithm>
-#include <cerrno>
 #include <cstring>
 
+#include "platform/FileContent.h"
+
 namespace ventras {
-namespace {
-
-bool writeAll(int file, const char* bytes, std::size_t count) {
-    while (count > 0) {
-        const auto written = write(file, bytes, count);
-        if (written < 0 && errno == EINTR)
-            continue;
-        if (written <= 0)
-            return false;
-        bytes += written;
-        count -= static_cast<std::size_t>(written);
-    }
-    return true;
-}
-
-}  // namespace
 
 bool ResponseBody::refill() {
     const auto length = httpRead2(connection_, block_.data(), block_.size());
@@ -53,7 +36,7 @@ IppPtr ResponseBody::readMessage() {
 
 bool ResponseBody::copyDocument(int file) {
     do {
-        if (!writeAll(file, block_.data() + begin_, end_ - begin_))
+        if (!writeAll(file, {block_.data() + begin_, end_ - begin_}))
             return false;
     } while (refill());
     return httpGetState(connection_) == HTTP_STATE_WAITING;
