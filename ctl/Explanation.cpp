@@ -21,13 +21,15 @@ namespace ventras {
 namespace {
 
 /// What would become of the device.
-std::string outcomeOf(std::int32_t status, const std::optional<std::string>& servingQueue) {
+/// @param servingQueue the queue that serves it already
+std::string outcomeOf(std::int32_t status, VentrasPrinterObject& device,
+                      const std::optional<std::string>& servingQueue) {
     if (status == QueueStatus::kCreated)
         return "a queue would be made";
     if (status == QueueStatus::kAlreadyExists)
         return servingQueue == "" ? "nothing: it has no address by which to tell"
                                   : "nothing: a queue serves it";
-    const auto reason = "no queue: " + std::string(QueueStatus::describe(status));
+    const auto reason = "no queue: " + QueueStatus::describe(status, device);
     return status == QueueStatus::kNoDriver ? reason + "; software for it would be looked for" : reason;
 }
 
@@ -95,7 +97,7 @@ Object explain(VentrasPrinterObject& device, Services& services) {
         {"queueReason", serving ? reasonFor(*serving, device, queues) : Value{}},
         {"driverList", drivers},
         {"status", status},
-        {"outcome", outcomeOf(status, serving)},
+        {"outcome", outcomeOf(status, device, serving)},
         {"difficulty", device.difficulty()},
         {"driverPackage", offer.package},
         {"packageReason", wantsPackage ? Value(offer.reason) : Value()},

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <array>
 
+#include "devices/VentrasPrinterObject.h"
 #include "platform/PrintSystemService.h"
 
 namespace ventras::QueueStatus {
@@ -30,6 +31,11 @@ constexpr std::array kTexts{
 std::string_view describe(std::int32_t status) {
     const auto known = std::ranges::find(kTexts, status, &Text::status);
     return known == kTexts.end() ? "the print system reports this status" : known->text;
+}
+
+std::string describe(std::int32_t status, VentrasPrinterObject& device) {
+    const auto difficulty = status == kCannotHandle ? device.difficulty() : std::nullopt;
+    return difficulty ? *difficulty : std::string(describe(status));
 }
 
 }  // namespace ventras::QueueStatus

@@ -1,9 +1,12 @@
 #pragma once
 
 #include <cstdint>
+#include <string>
 #include <string_view>
 
 namespace ventras {
+
+class VentrasPrinterObject;
 
 /// Outcomes of making a queue that are this system's own; every other value is the print system's.
 namespace QueueStatus {
@@ -24,6 +27,9 @@ constexpr bool isServed(std::int32_t status) {
 /// Why a device that is not served has no queue, in words for the log and for people. Any thread may call.
 /// @param status one of these, or a PrintSystemStatus
 std::string_view describe(std::int32_t status);
+
+/// The same of one device, which may know better what it lacks. On the thread of the device.
+std::string describe(std::int32_t status, VentrasPrinterObject& device);
 }  // namespace QueueStatus
 
 }  // namespace ventras

@@ -34,9 +34,7 @@ void VentraOperation::logFailure() const {
     auto label = printer_->deviceURI().value_or("");
     if (label.empty())
         label = printer_->name().value_or("unknown device");
-    const auto difficulty = status_ == QueueStatus::kCannotHandle ? printer_->difficulty() : std::nullopt;
-    platform_.log.error("No queue for " + label + ": " +
-                        difficulty.value_or(std::string(QueueStatus::describe(status_))) + " (" +
+    platform_.log.error("No queue for " + label + ": " + QueueStatus::describe(status_, *printer_) + " (" +
                         std::to_string(status_) + ")");
 }
 
