@@ -42,7 +42,7 @@ bool MessageLimits::take(std::uint32_t tag) {
     if (tag == IPP_TAG_END)
         return expect(Field::End, 0);
     if (tag < IPP_TAG_UNSUPPORTED_VALUE)
-        return expect(Field::Tag, 1);
+        return ++groups_ <= kMostGroups && expect(Field::Tag, 1);
     if (tag == IPP_TAG_EXTENSION)
         return false;
     if (tag == IPP_TAG_BEGIN_COLLECTION)

@@ -86,7 +86,7 @@ TEST_F(HttpTricks, WithoutEndAreListenedToOnlySoLong) {
     const auto run = agent_.run(uris, 60s);
     EXPECT_EQ(run.exitStatus, kCannotHandle) << run.story();
     EXPECT_LT(run.wallTime, 40s);
-    EXPECT_LT(run.peakKilobytes, 350'000 * kAllowance);
+    EXPECT_LT(run.peakKilobytes, 100'000 * kAllowance);
     for (const auto& uri : uris)
         EXPECT_THAT(run.standardError, HasSubstr(uri));
     EXPECT_EQ(newQueues(), Names{});

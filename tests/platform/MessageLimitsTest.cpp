@@ -85,8 +85,14 @@ TEST(MessageLimits, AllowAQuarterOfAMillionValues) {
     EXPECT_FALSE(passes(kHeader + repeated(value, 250'001) + kEndOfMessage));
 }
 
-TEST(MessageLimits, CountNoGroupsAndTheMembersOfCollections) {
-    EXPECT_TRUE(passes(kHeader + repeated("\4"s, 250'001) + kEndOfMessage));
+// libcups makes an attribute of each that follows one of its kind.
+TEST(MessageLimits, AllowAHundredThousandGroups) {
+    EXPECT_TRUE(passes(kHeader + repeated("\4"s, 99'999) + kEndOfMessage));  // one is in the header
+    EXPECT_FALSE(passes(kHeader + repeated("\4"s, 100'000) + kEndOfMessage));
+    EXPECT_FALSE(passes(kHeader + repeated("\2\4"s, 50'000) + kEndOfMessage));
+}
+
+TEST(MessageLimits, CountTheMembersOfCollections) {
     EXPECT_FALSE(passes(kHeader + repeated(nested(2), 50'001) + kEndOfMessage));
 }
 
