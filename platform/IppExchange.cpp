@@ -99,9 +99,23 @@ bool asksAgain(http_status_t status) {
     return status == HTTP_STATUS_UNAUTHORIZED || status == HTTP_STATUS_UPGRADE_REQUIRED;
 }
 
+// Reads what is left of an answer, so that the connection is ready for the next request; a peer that does not
+// come to an end is left.
+void finish(http_t* http) {
+    std::array<char, kBlock> rest;
+    for (std::size_t seen = 0; httpGetState(http) != HTTP_STATE_WAITING && seen < kBlock;) {
+        const auto length = httpRead2(http, rest.data(), rest.size());
+        if (length <= 0)
+            break;
+        seen += static_cast<std::size_t>(length);
+    }
+    if (httpGetState(http) != HTTP_STATE_WAITING)
+        httpShutdown(http);
+}
+
 // Does what the peer wants before it carries the request out, so that a further attempt makes sense.
 http_status_t comply(http_t* http, http_status_t status, const std::string& resource) {
-    httpFlush(http);
+    finish(http);
     if (status == HTTP_STATUS_UNAUTHORIZED && cupsDoAuthentication(http, "POST", resource.c_str()) != 0)
         return HTTP_STATUS_CUPS_AUTHORIZATION_CANCELED;
     if (asksAgain(status))
@@ -155,8 +169,7 @@ IppExchange exchangeOver(http_t* http, ipp_t* request, const std::string& resour
     auto answer = last.response ? answered(std::move(last.response)) : unanswered(http, last.status);
     if (answer.response && received >= 0 && !body.copyDocument(received))
         answer = {nullptr, IPP_STATUS_ERROR_INTERNAL, "the document that came back is incomplete"};
-    if (httpGetState(http) != HTTP_STATE_WAITING)
-        httpFlush(http);
+    finish(http);
     return {std::move(answer), heardNothing};
 }
 

@@ -66,6 +66,16 @@ TEST_P(AnswersThatEnd, EndTheRunAtOnce) {
     expectHarmless(agent_, run);
 }
 
+TEST_F(HttpTricks, ThatAreRefusedAreNotHeardToTheirEnd) {
+    const std::string begin = kOk + "\r\n\2\0\0\0\0\0\0\1\4"s;
+    for (const auto& more : {"\x42\0\1x\0\1y"s, "\x34\0\0\0\0\x4a\0\0\0\1m"s, "\2\4"s}) {
+        const RawPeer peer({begin, more});
+        const auto run = agent_.run({peer.uri()}, 25s);
+        EXPECT_EQ(run.exitStatus, kCannotHandle) << run.story();
+        EXPECT_LT(run.wallTime, 5s * kAllowance) << testing::PrintToString(more);
+    }
+}
+
 // Side by side: the longest of them is what a run takes.
 TEST_F(HttpTricks, WithoutEndAreListenedToOnlySoLong) {
     const RawSpeech speeches[] = {
