@@ -1,5 +1,6 @@
 #include "platform/IppExchange.h"
 
+#include <sys/socket.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -109,8 +110,10 @@ void finish(http_t* http) {
             break;
         seen += static_cast<std::size_t>(length);
     }
-    if (httpGetState(http) != HTTP_STATE_WAITING)
-        httpShutdown(http);
+    if (httpGetState(http) == HTTP_STATE_WAITING)
+        return;
+    shutdown(httpGetFd(http), SHUT_RDWR);
+    httpFlush(http);  // at an end now; only this frees what unpacks an answer
 }
 
 // Does what the peer wants before it carries the request out, so that a further attempt makes sense.
