@@ -10,6 +10,7 @@
 #include "platform/linux/options/UsbOptionSelection.h"
 #include "tests/fakes/FakePlatform.h"
 #include "tests/kernel/VhciPort.h"
+#include "tests/usb/PostScriptModel.h"
 
 namespace ventras {
 namespace {
@@ -20,24 +21,16 @@ using testing::HasSubstr;
 using testing::IsEmpty;
 using testing::Optional;
 
-constexpr const char* kURI = "usb://Example/PS%209000?serial=A1";
-
 /// What a PostScript interpreter says: a real one would take longer to start, on an emulated processor, than
 /// it has time for an answer.
 std::string answerProduct(std::string_view program) {
     return program.find("product ==") == program.npos ? "" : "(Example PS 9000)\r\n";
 }
 
-FakePrinterModel postScriptModel() {
-    FakePrinterModel model;
-    model.deviceID = "MFG:Example;MDL:PS 9000;CMD:POSTSCRIPT;SN:A1;";
-    return model;
-}
-
 class KernelOptionSelection : public testing::Test {
 protected:
     std::optional<std::string> product() {
-        UsbOptionSelection selection(kURI, fakes.log);
+        UsbOptionSelection selection(kPostScriptURI, fakes.log);
         status = selection.autoSelectPPD();
         return selection.autoSelectGetInfo().product;
     }

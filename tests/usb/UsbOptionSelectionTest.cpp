@@ -15,6 +15,7 @@
 #include "tests/parts/PostScriptInterpreter.h"
 #include "tests/parts/TemporaryFolder.h"
 #include "tests/parts/UsbBench.h"
+#include "tests/usb/PostScriptModel.h"
 #include "tests/usb/PostScriptPpd.h"
 
 namespace ventras {
@@ -27,16 +28,9 @@ using testing::IsEmpty;
 using testing::Not;
 using testing::Optional;
 
-constexpr const char* kURI = "usb://Example/PS%209000?serial=A1";
 constexpr const char* kPrologue =
     "/statusdict 10 dict def statusdict /product (Example PS 9000) put /duplexerInstalled true def /trays 2 "
     "def";
-
-FakePrinterModel postScriptModel() {
-    FakePrinterModel model;
-    model.deviceID = "MFG:Example;MDL:PS 9000;CMD:POSTSCRIPT;SN:A1;";
-    return model;
-}
 
 class UsbAutoSelect : public testing::Test {
 protected:
@@ -47,14 +41,14 @@ protected:
         return printer;
     }
 
-    std::optional<std::string> product(const std::string& uri = kURI) {
+    std::optional<std::string> product(const std::string& uri = kPostScriptURI) {
         UsbOptionSelection selection(uri, fakes.log);
         status = selection.autoSelectPPD();
         return selection.autoSelectGetInfo().product;
     }
 
     /// The text of the new PPD, empty when there is none.
-    std::string newPpd(const std::string& uri = kURI) {
+    std::string newPpd(const std::string& uri = kPostScriptURI) {
         UsbOptionSelection selection(uri, fakes.log);
         status = selection.autoSelectInstallableOptions(folder.write("driver.ppd", postScriptPpd()));
         const auto url = selection.autoSelectHasNewPPD();
@@ -119,7 +113,7 @@ TEST_F(UsbAutoSelect, TellsWhetherTheChannelTakesBinaryData) {
         auto& printer = attach();
         printer.interpreter = PostScriptInterpreter(
             kPrologue + " /currentdevparams {pop 1 dict dup /Protocol "s + protocol + " put} def");
-        UsbOptionSelection selection(kURI, fakes.log);
+        UsbOptionSelection selection(kPostScriptURI, fakes.log);
         EXPECT_EQ(selection.autoSelectPPD(), 0);
         EXPECT_EQ(selection.autoSelectGetInfo().isBinaryOK, isBinary) << protocol;
         bench.unplug("1-4");
@@ -284,7 +278,7 @@ TEST_F(UsbAutoSelect, AsksNothingForAPpdWithoutQueries) {
     auto& printer = attach();
     auto text = postScriptPpd();
     text.erase(text.find("*OpenGroup"));
-    UsbOptionSelection selection(kURI, fakes.log);
+    UsbOptionSelection selection(kPostScriptURI, fakes.log);
     EXPECT_EQ(selection.autoSelectInstallableOptions(folder.write("plain.ppd", text)), 0);
     EXPECT_EQ(selection.autoSelectHasNewPPD(), std::nullopt);
     EXPECT_EQ(bench.node("1-4").timesOpened(), 0);
@@ -293,7 +287,7 @@ TEST_F(UsbAutoSelect, AsksNothingForAPpdWithoutQueries) {
 
 TEST_F(UsbAutoSelect, FailsForAPpdThatIsNone) {
     attach();
-    UsbOptionSelection selection(kURI, fakes.log);
+    UsbOptionSelection selection(kPostScriptURI, fakes.log);
     EXPECT_NE(selection.autoSelectInstallableOptions(folder.write("bad.ppd", "no PPD")), 0);
     EXPECT_NE(selection.autoSelectInstallableOptions(folder / "absent.ppd"), 0);
 }
@@ -302,7 +296,7 @@ TEST_F(UsbAutoSelect, DeletesANewPpdThatNobodyTakes) {
     attach();
     setenv("TMPDIR", folder.path().c_str(), 1);
     {
-        UsbOptionSelection selection(kURI, fakes.log);
+        UsbOptionSelection selection(kPostScriptURI, fakes.log);
         EXPECT_EQ(selection.autoSelectInstallableOptions(folder.write("driver.ppd", postScriptPpd())), 0);
     }
     unsetenv("TMPDIR");
@@ -372,7 +366,7 @@ TEST_F(UsbAutoSelect, GivesThePrinterBackWhenTheProcessIsToldToEnd) {
     // The program asks on and on; it is another process so that it may die of the signal.
     const pid_t child = fork();
     if (child == 0) {
-        execl("/proc/self/exe", "ventras-usb-test", "--ask-product", kURI, nullptr);
+        execl("/proc/self/exe", "ventras-usb-test", "--ask-product", kPostScriptURI, nullptr);
         _exit(127);
     }
     const auto deadline = std::chrono::steady_clock::now() + 20s;
