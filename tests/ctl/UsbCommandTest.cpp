@@ -24,9 +24,8 @@ protected:
     }
 
     ProgramResult run(std::vector<std::string> arguments) {
-        auto environment = scheduler_.environment();
-        environment.merge(bench_.environment());
-        return ctl(std::move(arguments), {.environment = environment});
+        return ctl(std::move(arguments),
+                   {.environment = together({scheduler_.environment(), bench_.environment()})});
     }
 
     UsbBench bench_;

@@ -92,11 +92,7 @@ class UsbFilterLines : public HostileRun {
 protected:
     UsbFilterLines() : HostileRun({.models = {{}}}) {}
 
-    Environment environment() const {
-        auto all = scheduler_.environment();
-        all.merge(bench_.environment());
-        return all;
-    }
+    Environment environment() const { return together({scheduler_.environment(), bench_.environment()}); }
 
     void plugIn(const std::string& deviceID) {
         FakePrinterModel model;

@@ -36,13 +36,6 @@ TestPackage brotherDriver() {
             .files = {{"usr/share/cups/drv/brlaser.drv", readFile("/usr/share/cups/drv/brlaser.drv")}}};
 }
 
-Environment together(std::initializer_list<Environment> parts) {
-    Environment all;
-    for (const auto& part : parts)
-        all.insert(part.begin(), part.end());
-    return all;
-}
-
 // The whole program with a real scheduler that has no drivers, real package management, the catalogue's real
 // service, an emulated USB, and a user at the buttons of a notification.
 class AgentInstall : public testing::Test {

@@ -24,7 +24,6 @@ using Names = std::vector<std::string>;
 
 constexpr const char* kLocation = "-u17825792,0";  // 1-1
 constexpr const char* kPclID = "MFG:HP;MDL:HP LaserJet;CMD:PCL;SN:C4;";
-constexpr const char* kEndOfPclPage = "\x1b*r0B";
 // An emulated processor is slow.
 constexpr auto kLimit = 90s;
 

@@ -116,6 +116,9 @@ private:
     std::string toSend_;
 };
 
+/// What ends the raster graphics of a page in PCL.
+inline constexpr const char* kEndOfPclPage = "\x1b*r0B";
+
 /// The requests that the tests look for.
 bool isGetDeviceID(const UsbSetup& setup);
 bool isGetDeviceDescriptor(const UsbSetup& setup);

@@ -126,6 +126,13 @@ public:
 
 }  // namespace
 
+Environment together(std::initializer_list<Environment> parts) {
+    Environment all;
+    for (const auto& part : parts)
+        all.insert(part.begin(), part.end());
+    return all;
+}
+
 RunningProgram::RunningProgram(const std::vector<std::string>& arguments, const ProgramOptions& options)
     : started_(std::chrono::steady_clock::now()) {
     const int input = memoryFile("input", options.standardInput);

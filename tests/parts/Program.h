@@ -3,6 +3,7 @@
 #include <sys/types.h>
 
 #include <chrono>
+#include <initializer_list>
 #include <map>
 #include <optional>
 #include <string>
@@ -12,6 +13,9 @@ namespace ventras {
 
 /// Variables for a program, on top of the test's own environment.
 using Environment = std::map<std::string, std::string>;
+
+/// The variables of all parts; one that several have is as in the first of them.
+Environment together(std::initializer_list<Environment> parts);
 
 /// How a program is to run.
 struct ProgramOptions {

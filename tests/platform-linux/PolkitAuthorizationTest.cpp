@@ -115,9 +115,7 @@ TEST(PolkitAuthorization, RefusesTheOwnerOfTheSchedulerWherePolkitDoes) {
     const PrivateBus bus;
     Authority authority(kChallenge);
     const PrivateScheduler scheduler({.user = ordinaryUser()});
-    auto environment = scheduler.environment();
-    environment.merge(bus.environment());
-    EXPECT_EQ(ask(environment), EX_NOPERM);
+    EXPECT_EQ(ask(together({scheduler.environment(), bus.environment()})), EX_NOPERM);
 }
 
 TEST(PolkitAuthorization, GivesUpOnAPolkitThatHangs) {

@@ -51,10 +51,8 @@ protected:
     }
 
     int ask(const Environment& more = {{"CUPS_SERVER", "/nonexistent/cups.sock"}}) {
-        auto environment = bus_.environment();
-        environment.insert(more.begin(), more.end());
         return runProgram({VENTRAS_TEST_ASK_POLKIT, "system.print.admin"},
-                          {.environment = environment, .user = ordinaryUser()}, 30s)
+                          {.environment = together({bus_.environment(), more}), .user = ordinaryUser()}, 30s)
             .exitStatus;
     }
 

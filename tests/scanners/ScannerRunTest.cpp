@@ -40,8 +40,7 @@ protected:
     }
 
     Environment environment() const {
-        auto all = scheduler_.environment();
-        all.merge(bench_.environment());
+        auto all = together({scheduler_.environment(), bench_.environment()});
         all["VENTRAS_SCANNER_CONFIGURATION"] = modules_.path();
         all["VENTRAS_SCANNER_MODULES"] = modules_.path();
         return all;

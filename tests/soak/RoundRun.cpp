@@ -50,10 +50,7 @@ RoundRun::RoundRun(Workshop& workshop, const RoundPlan& plan, int round)
       usb_(plan.place == Place::Program ? std::make_unique<UsbBench>() : nullptr) {}
 
 Environment RoundRun::environment() const {
-    auto all = workshop_.environment();
-    if (usb_)
-        all.merge(usb_->environment());
-    return all;
+    return together({workshop_.environment(), usb_ ? usb_->environment() : Environment{}});
 }
 
 RoundResult RoundRun::run() {

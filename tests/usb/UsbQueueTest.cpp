@@ -32,8 +32,6 @@ constexpr const char* kPrologue =
     "/statusdict 10 dict def statusdict /product (Example PS 9000) put /duplexerInstalled true def /trays 2 "
     "def";
 
-constexpr const char* kEndOfPclPage = "\x1b*r0B";
-
 FakePrinterModel printerSaying(std::string deviceID) {
     FakePrinterModel model;
     model.deviceID = std::move(deviceID);
@@ -56,11 +54,6 @@ protected:
 
     void useStockBackend() const { useStockUsbBackend(scheduler, VENTRAS_USB_BACKEND, bench.environment()); }
 
-    static Environment together(Environment one, const Environment& other) {
-        one.insert(other.begin(), other.end());
-        return one;
-    }
-
     FakePrinter& attach(FakePrinterModel model, const std::string& place = "1-4") {
         auto& printer = bench.plugIn(place, std::move(model));
         bench.node(place).bindDriver(0, "usblp");
@@ -69,7 +62,7 @@ protected:
 
     UsbBench bench;
     PrivateScheduler scheduler{{.models = {{}}}};
-    Agent agent{together(scheduler.environment(), bench.environment()), std::nullopt};
+    Agent agent{together({scheduler.environment(), bench.environment()}), std::nullopt};
 };
 
 TEST_F(UsbQueue, OfALaserPrinterHasItsOwnDriver) {
