@@ -56,7 +56,7 @@ Environment RoundRun::environment() const {
 RoundResult RoundRun::run() {
     if (plan_.event == SchedulerEvent::Killed)
         workshop_.saveQueues();
-    const auto before = workshop_.stateOfPresentQueue();
+    const auto before = stateOfQueues(workshop_.scheduler(), {Workshop::kPresent});
     for (const auto& plan : plan_.devices)
         devices_.push_back(attach(plan));
     planEvents();
@@ -65,8 +65,8 @@ RoundResult RoundRun::run() {
     else
         runProgram();
     checkQueues();
-    if (workshop_.stateOfPresentQueue() != before)
-        object("somebody else's queue has changed:\n" + workshop_.stateOfPresentQueue());
+    if (const auto after = stateOfQueues(workshop_.scheduler(), {Workshop::kPresent}); after != before)
+        object("somebody else's queue has changed:\n" + after);
     checkRemains();
     for (const auto& queue : workshop_.newQueues())
         workshop_.scheduler().deleteQueue(queue);

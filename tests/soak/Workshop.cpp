@@ -32,14 +32,6 @@ std::vector<std::string> Workshop::newQueues() const {
     return queues;
 }
 
-std::string Workshop::stateOfPresentQueue() const {
-    std::string state;
-    for (const auto* name : {"device-uri", "printer-info", "printer-location", "printer-make-and-model",
-                             "printer-state", "printer-is-accepting-jobs", "printer-is-shared"})
-        state += std::string(name) + "=" + scheduler_.attribute(kPresent, name) + "\n";
-    return state + scheduler_.ppd(kPresent);
-}
-
 std::vector<std::string> Workshop::leftovers() const {
     std::vector<std::string> files;
     for (const auto& entry : fs::directory_iterator(temporary_.path()))

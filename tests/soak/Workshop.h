@@ -30,9 +30,6 @@ public:
     /// The queues that are not somebody else's.
     std::vector<std::string> newQueues() const;
 
-    /// What of somebody else's queue must stay as it is, as text.
-    std::string stateOfPresentQueue() const;
-
     /// Temporary files that this process has left; folders are the parts' own.
     std::vector<std::string> leftovers() const;
 
