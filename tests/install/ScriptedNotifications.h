@@ -8,7 +8,7 @@
 #include <string>
 #include <vector>
 
-#include "tests/install/BusObject.h"
+#include "tests/platform-linux/BusObject.h"
 #include "tests/platform-linux/BusThread.h"
 
 namespace ventras {

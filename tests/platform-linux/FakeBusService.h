@@ -1,8 +1,10 @@
 #pragma once
 
 #include <functional>
+#include <optional>
 #include <string>
 
+#include "tests/platform-linux/BusObject.h"
 #include "tests/platform-linux/BusThread.h"
 
 namespace ventras {
@@ -24,6 +26,7 @@ public:
 
 private:
     Handler handler_;
+    std::optional<BusObject> object_;
     BusThread thread_;
 };
 

@@ -1,4 +1,4 @@
-#include "tests/install/BusObject.h"
+#include "tests/platform-linux/BusObject.h"
 
 #include <memory>
 #include <stdexcept>
