@@ -10,6 +10,7 @@
 #include <thread>
 
 #include "platform/linux/installer/DialogPrompter.h"
+#include "tests/install/StopSoon.h"
 #include "tests/parts/TemporaryFolder.h"
 
 namespace ventras {
@@ -108,10 +109,7 @@ TEST_F(Dialog, ThatStaysOpenIsTakenAwayInTime) {
 
 TEST_F(Dialog, EndsWithItsThread) {
     install("zenity", "exec sleep 60");
-    const std::jthread stopper([this] {
-        std::this_thread::sleep_for(50ms);
-        stop_.request_stop();
-    });
+    const auto stopper = stopSoon(stop_);
     const auto start = Clock::now();
     EXPECT_EQ(ask(30s), PromptAnswer::Unanswered);
     EXPECT_LT(Clock::now() - start, 5s);

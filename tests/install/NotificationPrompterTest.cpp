@@ -3,10 +3,10 @@
 
 #include <chrono>
 #include <stop_token>
-#include <thread>
 
 #include "platform/linux/installer/NotificationPrompter.h"
 #include "tests/install/ScriptedNotifications.h"
+#include "tests/install/StopSoon.h"
 #include "tests/platform-linux/PrivateBus.h"
 
 namespace ventras {
@@ -142,10 +142,7 @@ TEST(NotificationPrompter, IsNotAskedWithoutASession) {
 
 TEST_F(Notification, EndsWithItsThread) {
     ScriptedNotifications service;
-    const std::jthread stopper([this] {
-        std::this_thread::sleep_for(50ms);
-        stop_.request_stop();
-    });
+    const auto stopper = stopSoon(stop_);
     const auto start = Clock::now();
     EXPECT_EQ(ask(30s), PromptAnswer::Unanswered);
     EXPECT_LT(Clock::now() - start, 5s);

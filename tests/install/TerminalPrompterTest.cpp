@@ -10,6 +10,7 @@
 
 #include "platform/linux/FileDescriptor.h"
 #include "platform/linux/installer/TerminalPrompter.h"
+#include "tests/install/StopSoon.h"
 
 namespace ventras {
 namespace {
@@ -107,10 +108,7 @@ TEST_F(Terminal, DoesNotTakeHalfALine) {
 }
 
 TEST_F(Terminal, EndsWithItsThread) {
-    const std::jthread stopper([this] {
-        std::this_thread::sleep_for(50ms);
-        stop_.request_stop();
-    });
+    const auto stopper = stopSoon(stop_);
     EXPECT_EQ(ask(30s), PromptAnswer::Unanswered);
 }
 
