@@ -6,6 +6,7 @@
 #include "drivers/PPDManager.h"
 #include "tests/drivers/PPDText.h"
 #include "tests/fakes/FakePlatform.h"
+#include "tests/parts/OpenedPpd.h"
 
 namespace ventras {
 namespace {
@@ -26,8 +27,7 @@ protected:
     }
 
     std::optional<PPDRecord> askForPPD(const Lines& lines) {
-        const PpdPtr ppd{ppdOpenFile(folder_.write("a.ppd", ppdText(lines)).c_str())};
-        return manager_.softwareUpdateForPPD(ppd.get());
+        return manager_.softwareUpdateForPPD(openedPpd(ppdText(lines)).get());
     }
 
     Lines asked() const {
@@ -39,7 +39,6 @@ protected:
 
     FakePlatform fakes_;
     PPDManager manager_{fakes_.platform};
-    TemporaryFolder folder_;
 };
 
 TEST_F(SoftwareUpdateDriver, IsAskedForWithTheAgentsFirstCommand) {

@@ -1,6 +1,5 @@
 #include "tests/hostile/HostileRun.h"
 
-#include <cups/ppd.h>
 #include <strings.h>
 
 #include <algorithm>
@@ -8,8 +7,8 @@
 #include <fstream>
 #include <sstream>
 
-#include "platform/Handles.h"
 #include "platform/Utf8.h"
+#include "tests/parts/OpenedPpd.h"
 
 namespace ventras {
 namespace {
@@ -28,11 +27,6 @@ constexpr const char* kDriver =
 
 bool beginsIgnoringCase(const std::string& line, std::string_view beginning) {
     return strncasecmp(line.c_str(), beginning.data(), beginning.size()) == 0;
-}
-
-bool opens(const std::string& ppd) {
-    const TemporaryFolder folder;
-    return PpdPtr(ppdOpenFile(folder.write("queue.ppd", ppd).c_str())) != nullptr;
 }
 
 }  // namespace
@@ -82,7 +76,7 @@ void HostileRun::expectHarmless(const Agent& agent, const AgentRun& run) const {
     EXPECT_EQ(stateOfQueues(scheduler_, {kPresent}), before_);
     for (const auto& queue : newQueues()) {
         const auto ppd = scheduler_.ppd(queue);
-        EXPECT_TRUE(opens(ppd)) << queue << " is a raw queue";
+        EXPECT_TRUE(openedPpd(ppd)) << queue << " is a raw queue";
         EXPECT_EQ(evilLines(ppd), Names{}) << queue;
         EXPECT_EQ(scheduler_.attribute(queue, "printer-state"), "3") << queue;
         EXPECT_EQ(scheduler_.attribute(queue, "printer-is-accepting-jobs"), "true") << queue;

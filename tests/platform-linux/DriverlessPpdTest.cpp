@@ -7,6 +7,7 @@
 
 #include "platform/linux/ppd/DriverRules.h"
 #include "platform/linux/ppd/PpdFile.h"
+#include "tests/parts/OpenedPpd.h"
 #include "tests/parts/ScriptedPrinter.h"
 #include "tests/parts/TemporaryFolder.h"
 #include "tests/platform-linux/PrinterDescription.h"
@@ -44,8 +45,7 @@ TEST(DriverlessPpd, HasReadableNamesForSizesInInches) {
     database.push_back(media(size(10160, 15240), "tray-1", "stationery"));
     Description description;
     description.collections("media-col-database", database);
-    const TemporaryFolder folder;
-    const PpdPtr ppd{ppdOpenFile(folder.write("x.ppd", ppdOf(description)).c_str())};
+    const auto ppd = openedPpd(ppdOf(description));
     ASSERT_TRUE(ppd);
     const auto* choice = ppdFindChoice(ppdFindOption(ppd.get(), "PageSize"), "4x6");
     ASSERT_NE(choice, nullptr);

@@ -12,6 +12,7 @@
 #include "platform/linux/ppd/PpdFile.h"
 #include "tests/fakes/FakePlatform.h"
 #include "tests/parts/BlackHole.h"
+#include "tests/parts/OpenedPpd.h"
 #include "tests/parts/PrivateScheduler.h"
 #include "tests/parts/ScriptedPrinter.h"
 #include "tests/parts/TemporaryFolder.h"
@@ -57,8 +58,7 @@ Selection select(const std::string& uri, const std::string& ppdPath = kGeneric) 
 
 // The choices of one option of a PPD, as libcups reads them.
 std::set<std::string> choices(const std::string& text, const char* option) {
-    const TemporaryFolder folder;
-    const PpdPtr ppd{ppdOpenFile(folder.write("x.ppd", text).c_str())};
+    const auto ppd = openedPpd(text);
     std::set<std::string> found;
     const auto* entry = ppd ? ppdFindOption(ppd.get(), option) : nullptr;
     for (int i = 0; entry != nullptr && i < entry->num_choices; ++i)
@@ -67,8 +67,7 @@ std::set<std::string> choices(const std::string& text, const char* option) {
 }
 
 std::string attribute(const std::string& text, const char* keyword) {
-    const TemporaryFolder folder;
-    const PpdPtr ppd{ppdOpenFile(folder.write("x.ppd", text).c_str())};
+    const auto ppd = openedPpd(text);
     const auto* entry = ppd ? ppdFindAttr(ppd.get(), keyword, nullptr) : nullptr;
     return entry == nullptr || entry->value == nullptr ? "" : entry->value;
 }

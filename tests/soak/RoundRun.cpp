@@ -1,7 +1,5 @@
 #include "tests/soak/RoundRun.h"
 
-#include <cups/ppd.h>
-
 #include <algorithm>
 #include <atomic>
 #include <filesystem>
@@ -9,9 +7,9 @@
 
 #include "devices/VellumProfilePrinterObject.h"
 #include "drivers/PPDManager.h"
-#include "platform/Handles.h"
 #include "platform/linux/LinuxPlatform.h"
 #include "queues/QueueMaker.h"
+#include "tests/parts/OpenedPpd.h"
 #include "tests/soak/Census.h"
 
 namespace ventras {
@@ -29,11 +27,6 @@ struct UsbPlace {
 
 // Bus and ports, and as one number.
 constexpr UsbPlace kUsbPlaces[] = {{"1-4", "-u20971520,0"}, {"1-5", "-u22020096,0"}, {"2-1", "-u34603008,0"}};
-
-bool opens(const std::string& ppd) {
-    const TemporaryFolder folder;
-    return PpdPtr(ppdOpenFile(folder.write("queue.ppd", ppd).c_str())) != nullptr;
-}
 
 std::string guardFile(std::string uri) {
     std::ranges::replace_if(
@@ -230,7 +223,7 @@ void RoundRun::checkQueue(const std::string& queue) {
     const auto uri = scheduler.attribute(queue, "device-uri");
     if (std::ranges::find(devices_, uri, &Device::uri) == devices_.end())
         object(queue + " has a device that is none of the round's: " + uri);
-    if (!opens(scheduler.ppd(queue)))
+    if (!openedPpd(scheduler.ppd(queue)))
         object(queue + " has no PPD that opens");
     if (scheduler.attribute(queue, "printer-state") != "3" ||
         scheduler.attribute(queue, "printer-is-accepting-jobs") != "true")

@@ -4,7 +4,7 @@
 
 #include <string>
 
-#include "tests/parts/TemporaryFolder.h"
+#include "tests/parts/OpenedPpd.h"
 #include "tests/usb/PostScriptPpd.h"
 
 namespace ventras {
@@ -15,8 +15,7 @@ using testing::Optional;
 using testing::SizeIs;
 
 std::vector<PpdQuery> queriesIn(const std::string& text) {
-    const TemporaryFolder folder;
-    const PpdPtr ppd{ppdOpenFile(folder.write("queries.ppd", text).c_str())};
+    const auto ppd = openedPpd(text);
     EXPECT_TRUE(ppd) << text;
     return ppd ? installableOptionQueries(ppd.get()) : std::vector<PpdQuery>{};
 }
