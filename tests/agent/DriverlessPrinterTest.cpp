@@ -2,9 +2,9 @@
 
 #include <algorithm>
 #include <memory>
-#include <thread>
 
 #include "tests/agent/Agent.h"
+#include "tests/parts/ComesTrue.h"
 #include "tests/parts/ScriptedPrinter.h"
 #include "tests/parts/VirtualPrinter.h"
 
@@ -179,9 +179,7 @@ TEST_P(DriverlessPrinter, DoesNotWaitForASlowOne) {
     const ScriptedPrinter slow({.name = "Slow", .delay = 4s});
     const ScriptedPrinter fast({.name = "Fast"});
     auto running = agent_.start({slow.uri(), fast.uri()});
-    const auto giveUp = std::chrono::steady_clock::now() + 3s;
-    while (scheduler_.queues().empty() && std::chrono::steady_clock::now() < giveUp)
-        std::this_thread::sleep_for(10ms);
+    comesTrue([&] { return !scheduler_.queues().empty(); }, 3s);
     EXPECT_EQ(scheduler_.queues(), Names{"Fast"});
     ASSERT_TRUE(running->waitUntilEnded(60s));
     EXPECT_EQ(Agent::resultOf(*running).exitStatus, 0) << Agent::resultOf(*running).story();

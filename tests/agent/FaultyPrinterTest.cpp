@@ -3,10 +3,10 @@
 
 #include <algorithm>
 #include <memory>
-#include <thread>
 
 #include "tests/agent/Agent.h"
 #include "tests/parts/BlackHole.h"
+#include "tests/parts/ComesTrue.h"
 #include "tests/parts/ScriptedPrinter.h"
 
 namespace ventras {
@@ -113,9 +113,7 @@ TEST_F(FaultyPrinter, IsWaitedForOnlySoLong) {
     uris.push_back(printers.front()->uri("ipps"));
 
     auto running = agent_.start(uris);
-    const auto began = std::chrono::steady_clock::now();
-    while (scheduler_.queues().empty() && std::chrono::steady_clock::now() - began < 5s)
-        std::this_thread::sleep_for(10ms);
+    comesTrue([&] { return !scheduler_.queues().empty(); }, 5s);
     EXPECT_EQ(scheduler_.queues(), Names{"Good"}) << "the good printer should not wait for the others";
 
     ASSERT_TRUE(running->waitUntilEnded(60s));

@@ -5,6 +5,7 @@
 #include <thread>
 
 #include "tests/agent/Agent.h"
+#include "tests/parts/ComesTrue.h"
 #include "tests/parts/ScriptedPrinter.h"
 
 namespace ventras {
@@ -79,8 +80,7 @@ TEST(FaultyScheduler, ThatDiesBeforeTheQueueIsMadeEndsTheRun) {
     const Agent agent(scheduler);
     const ScriptedPrinter printer({.delay = 1s});
     auto running = agent.start({printer.uri()});
-    while (printer.requests().empty())
-        std::this_thread::sleep_for(5ms);
+    ASSERT_TRUE(comesTrue([&] { return !printer.requests().empty(); }, 20s));
     scheduler.kill();
     ASSERT_TRUE(running->waitUntilEnded(20s));
     const auto run = Agent::resultOf(*running);

@@ -5,6 +5,7 @@
 #include "platform/linux/desktop/DBusPrintToolAgentChannel.h"
 #include "tests/catalogue/CatalogueTexts.h"
 #include "tests/fakes/PropertyValuePrinter.h"
+#include "tests/parts/ComesTrue.h"
 #include "tests/platform-linux/PrivateBus.h"
 
 namespace ventras {
@@ -37,11 +38,12 @@ protected:
 
     /// The first answer once the service is there.
     static PrintToolAgentReply askUntilAnswered(const PropertyDictionary& arguments) {
-        auto reply = ask(arguments);
-        for (int i = 0; i < 500 && reply.status != 0; ++i) {
-            std::this_thread::sleep_for(10ms);
+        PrintToolAgentReply reply;
+        const auto isAnswered = [&] {
             reply = ask(arguments);
-        }
+            return reply.status == 0;
+        };
+        comesTrue(isAnswered, 5s);
         return reply;
     }
 

@@ -7,10 +7,10 @@
 #include <csignal>
 #include <cstdlib>
 #include <filesystem>
-#include <thread>
 
 #include "platform/linux/installer/DialogPrompter.h"
 #include "tests/install/StopSoon.h"
+#include "tests/parts/ComesTrue.h"
 #include "tests/parts/TemporaryFolder.h"
 
 namespace ventras {
@@ -121,13 +121,10 @@ TEST_F(Dialog, ShowsProgressAndEnds) {
     prompter_.showProgress("Installing", std::nullopt);
     prompter_.showProgress("Installing", 40);
     prompter_.showProgress("Installing", 100);
-    const auto giveUp = Clock::now() + 5s;
-    while (!readFile(folder_ / "progress").ends_with("99\n") && Clock::now() < giveUp)
-        std::this_thread::sleep_for(5ms);
+    comesTrue([&] { return readFile(folder_ / "progress").ends_with("99\n"); }, 5s);
     EXPECT_EQ(readFile(folder_ / "progress"), "# Installing\n# Installing\n40\n# Installing\n99\n");
     prompter_.finish("It failed", "because");
-    while (calls().find("--info") == std::string::npos && Clock::now() < giveUp)
-        std::this_thread::sleep_for(5ms);
+    comesTrue([&] { return calls().find("--info") != std::string::npos; }, 5s);
     EXPECT_THAT(calls(),
                 HasSubstr("zenity|--info|--no-markup|--timeout=60|--title=It failed|--text=because|"));
 }

@@ -8,6 +8,7 @@
 
 #include "platform/linux/desktop/DBusCall.h"
 #include "platform/linux/installer/NotificationPrompter.h"
+#include "tests/parts/ComesTrue.h"
 #include "tests/parts/Program.h"
 #include "tests/parts/TemporaryFolder.h"
 #include "tests/platform-linux/PrivateBus.h"
@@ -84,8 +85,7 @@ private:
     }
 
     static void waitAndCall(const char* method) {
-        for (int i = 0; i < 500 && shown() == 0; ++i)
-            std::this_thread::sleep_for(10ms);
+        comesTrue([] { return shown() != 0; }, 5s);
         const DBusMethod call{Bus::Session, "org.freedesktop.Notifications", kPath, "org.dunstproject.cmd0",
                               method};
         callDBus(call, g_variant_new("()"), "()", 5s);

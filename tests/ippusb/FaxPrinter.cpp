@@ -8,6 +8,7 @@
 #include <chrono>
 #include <string_view>
 
+#include "tests/parts/ComesTrue.h"
 #include "tests/parts/ScriptedPrinter.h"
 
 namespace ventras {
@@ -89,10 +90,7 @@ std::vector<PrintedDocument> FaxPrinter::documents() const {
 }
 
 bool FaxPrinter::receivedWithin(std::chrono::milliseconds limit, std::size_t count) const {
-    const auto giveUp = std::chrono::steady_clock::now() + limit;
-    while (documents().size() < count && std::chrono::steady_clock::now() < giveUp)
-        std::this_thread::sleep_for(std::chrono::milliseconds(5));
-    return documents().size() >= count;
+    return comesTrue([&] { return documents().size() >= count; }, limit);
 }
 
 void FaxPrinter::accept() {

@@ -3,11 +3,11 @@
 #include <chrono>
 #include <cstdlib>
 #include <memory>
-#include <thread>
 
 #include "platform/PrintSystemService.h"
 #include "tests/agent/Agent.h"
 #include "tests/ippusb/FaxPrinter.h"
+#include "tests/parts/ComesTrue.h"
 #include "tests/parts/Loopback.h"
 #include "tests/parts/PrivateScheduler.h"
 #include "tests/responder/PrivateResponder.h"
@@ -56,13 +56,7 @@ protected:
 
     // Waits until an attribute of a queue says so.
     bool becomes(const std::string& queue, const std::string& attribute, const std::string& value) const {
-        const auto giveUp = std::chrono::steady_clock::now() + 20s;
-        while (scheduler_.attribute(queue, attribute) != value) {
-            if (std::chrono::steady_clock::now() > giveUp)
-                return false;
-            std::this_thread::sleep_for(20ms);
-        }
-        return true;
+        return comesTrue([&] { return scheduler_.attribute(queue, attribute) == value; }, 20s);
     }
 
     FaxPrinter printer_;

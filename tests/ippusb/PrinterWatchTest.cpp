@@ -6,6 +6,7 @@
 #include <string>
 #include <thread>
 
+#include "tests/parts/ComesTrue.h"
 #include "tests/parts/Program.h"
 #include "tests/parts/TemporaryFolder.h"
 #include "tests/responder/PrivateResponder.h"
@@ -39,10 +40,8 @@ protected:
 
     // Waits for so many runs, and a little longer for more than that.
     std::string runs(std::ptrdiff_t count) const {
-        const auto giveUp = std::chrono::steady_clock::now() + 10s;
         const auto text = [this] { return readFile(folder_ / "runs"); };
-        while (std::ranges::count(text(), '\n') < count && std::chrono::steady_clock::now() < giveUp)
-            std::this_thread::sleep_for(10ms);
+        comesTrue([&] { return std::ranges::count(text(), '\n') >= count; }, 10s);
         std::this_thread::sleep_for(200ms);
         return text();
     }

@@ -4,14 +4,13 @@
 #include <csignal>
 #include <filesystem>
 #include <fstream>
-#include <functional>
 #include <string>
-#include <thread>
 #include <vector>
 
 #include "tests/agent/Agent.h"
 #include "tests/ctl/Ctl.h"
 #include "tests/kernel/VhciPort.h"
+#include "tests/parts/ComesTrue.h"
 #include "tests/parts/PrivateScheduler.h"
 #include "tests/parts/StockUsbBackend.h"
 
@@ -64,13 +63,6 @@ class KernelQueue : public testing::Test {
 protected:
     KernelQueue() { installSampleDrivers(scheduler); }
 
-    static bool comesTrue(const std::function<bool()>& condition) {
-        const auto deadline = std::chrono::steady_clock::now() + kLimit;
-        while (!condition() && std::chrono::steady_clock::now() < deadline)
-            std::this_thread::sleep_for(20ms);
-        return condition();
-    }
-
     PrivateScheduler scheduler{{.models = {{}}}};
     Agent agent{scheduler};
 };
@@ -88,7 +80,7 @@ TEST_F(KernelQueue, PrintsThroughTheStockBackendToThePrinter) {
 
     scheduler.print(run.queueID(), "hello.pdf", {"page-ranges=1"});
     EXPECT_TRUE(port.printer().receives(kEndOfPclPage, kLimit)) << scheduler.errorLog();
-    EXPECT_TRUE(comesTrue([&] { return port.driver(0) == "usblp"; })) << port.driver(0);
+    EXPECT_TRUE(comesTrue([&] { return port.driver(0) == "usblp"; }, kLimit)) << port.driver(0);
 }
 
 TEST_F(KernelQueue, IsNotMadeForAPrinterThatSpeaksIppOverUsb) {

@@ -14,6 +14,7 @@
 #include "platform/linux/FileDescriptor.h"
 #include "platform/linux/usb/LibusbRegistry.h"
 #include "tests/kernel/VhciPort.h"
+#include "tests/parts/ComesTrue.h"
 #include "tests/usb/AttachedPrinters.h"
 #include "tests/usb/FaultyAnswers.h"
 
@@ -122,8 +123,7 @@ TEST_F(KernelRegistry, EndsARequestAtOnceWhenThePrinterIsUnplugged) {
         return std::optional{UsbAnswer::silence()};
     };
     std::thread unplugger([&] {
-        while (!isAsked)
-            std::this_thread::sleep_for(1ms);
+        EXPECT_TRUE(comesTrue([&] { return isAsked.load(); }, 60s));
         port.reset();
     });
     auto request = getDeviceID(256, 60s);

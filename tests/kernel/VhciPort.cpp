@@ -8,13 +8,11 @@
 #include <chrono>
 #include <cstdio>
 #include <fstream>
-#include <functional>
 #include <stdexcept>
 #include <system_error>
-#include <thread>
 #include <utility>
 
-#include "platform/Deadline.h"
+#include "tests/parts/ComesTrue.h"
 
 namespace ventras {
 namespace {
@@ -29,16 +27,6 @@ constexpr const char* kAttach = "/sys/devices/platform/vhci_hcd.0/attach";
 constexpr int kRemoteDevice = 0x00010002;
 constexpr int kHighSpeed = 3;
 constexpr auto kLimit = 20s;
-
-bool comesTrue(const std::function<bool()>& condition) {
-    const auto deadline = Deadline::after(kLimit);
-    while (!condition()) {
-        if (deadline.passed())
-            return false;
-        std::this_thread::sleep_for(5ms);
-    }
-    return true;
-}
 
 /// A port is free a moment after its device has gone.
 bool attach(int socket, int port) {
@@ -68,16 +56,16 @@ VhciPort::VhciPort(FakePrinterModel model, int port)
         throw std::system_error(errno, std::generic_category(), "socketpair");
     FileDescriptor own(ends[0]);
     const FileDescriptor kernels(ends[1]);
-    if (!comesTrue([&] { return attach(kernels.get(), port); }))
+    if (!comesTrue([&] { return attach(kernels.get(), port); }, kLimit))
         throw std::runtime_error(std::string(kAttach) + " takes no device");
     peer_ = std::make_unique<UsbipPeer>(std::move(own), printer_);
-    if (!comesTrue([this] { return isSetUp(); }))
+    if (!comesTrue([this] { return isSetUp(); }, kLimit))
         throw std::runtime_error("the kernel has not set up " + link_.string());
 }
 
 VhciPort::~VhciPort() {
     peer_.reset();
-    comesTrue([this] { return !isPresent(); });
+    comesTrue([this] { return !isPresent(); }, kLimit);
 }
 
 bool VhciPort::isPresent() const {

@@ -7,8 +7,9 @@
 #include <cerrno>
 #include <memory>
 #include <set>
-#include <thread>
 #include <utility>
+
+#include "tests/parts/ComesTrue.h"
 
 namespace ventras {
 namespace {
@@ -248,13 +249,7 @@ std::string FakePrinter::received() const {
 }
 
 bool FakePrinter::receives(std::string_view text, std::chrono::milliseconds limit) const {
-    const auto deadline = std::chrono::steady_clock::now() + limit;
-    while (received().find(text) == std::string::npos) {
-        if (std::chrono::steady_clock::now() > deadline)
-            return false;
-        std::this_thread::sleep_for(std::chrono::milliseconds(20));
-    }
-    return true;
+    return comesTrue([&] { return received().find(text) != std::string::npos; }, limit);
 }
 
 }  // namespace ventras

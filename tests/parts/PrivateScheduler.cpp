@@ -10,6 +10,7 @@
 #include <stdexcept>
 #include <thread>
 
+#include "tests/parts/ComesTrue.h"
 #include "tests/parts/Loopback.h"
 
 namespace ventras {
@@ -195,13 +196,7 @@ fs::path PrivateScheduler::sinkFile(const std::string& queue, int job) const {
 }
 
 bool PrivateScheduler::appears(const fs::path& file, std::chrono::milliseconds limit) {
-    const auto giveUp = std::chrono::steady_clock::now() + limit;
-    while (!fs::exists(file)) {
-        if (std::chrono::steady_clock::now() > giveUp)
-            return false;
-        std::this_thread::sleep_for(kGlance);
-    }
-    return true;
+    return comesTrue([&] { return fs::exists(file); }, limit);
 }
 
 std::string PrivateScheduler::errorLog() const {

@@ -5,6 +5,7 @@
 #include <csignal>
 #include <thread>
 
+#include "tests/parts/ComesTrue.h"
 #include "tests/parts/PrivateScheduler.h"
 
 namespace ventras {
@@ -158,8 +159,7 @@ TEST(PrivateScheduler, HasTheBackendsItWasGiven) {
              {"failing", "#!/bin/sh\n[ $# -eq 0 ] && exit 0\necho 'ERROR: out of paint' >&2\nexit 1\n"}}});
     scheduler.addQueue("Broken", "failing://x");
     scheduler.print("Broken", "hello.txt");
-    for (int i = 0; i < 500 && scheduler.attribute("Broken", "printer-state") != "5"; ++i)
-        std::this_thread::sleep_for(10ms);
+    comesTrue([&] { return scheduler.attribute("Broken", "printer-state") == "5"; }, 5s);
     EXPECT_EQ(scheduler.attribute("Broken", "printer-state"), "5") << scheduler.errorLog();
     EXPECT_THROW(scheduler.addQueue("Unknown", "nosuchscheme://x"), std::runtime_error);
 }

@@ -7,6 +7,7 @@
 #include <utility>
 
 #include "platform/Handles.h"
+#include "tests/parts/ComesTrue.h"
 #include "tests/parts/Loopback.h"
 
 namespace ventras {
@@ -126,13 +127,7 @@ std::vector<ReceivedDocument> VirtualPrinter::received() const {
 }
 
 bool VirtualPrinter::receivedWithin(std::chrono::milliseconds limit, std::size_t count) const {
-    const auto giveUp = std::chrono::steady_clock::now() + limit;
-    while (received().size() < count) {
-        if (std::chrono::steady_clock::now() > giveUp)
-            return false;
-        std::this_thread::sleep_for(kGlance);
-    }
-    return true;
+    return comesTrue([&] { return received().size() >= count; }, limit);
 }
 
 }  // namespace ventras

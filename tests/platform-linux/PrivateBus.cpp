@@ -8,10 +8,10 @@
 #include <csignal>
 #include <cstdlib>
 #include <stdexcept>
-#include <thread>
 
 #include "platform/linux/FileDescriptor.h"
 #include "platform/linux/desktop/DBusCall.h"
+#include "tests/parts/ComesTrue.h"
 
 namespace ventras {
 namespace {
@@ -45,12 +45,8 @@ bool takesConnections(const std::filesystem::path& path) {
 
 void waitForBus(const std::filesystem::path& socket) {
     using namespace std::chrono_literals;
-    for (int i = 0; i < 500; ++i) {
-        if (takesConnections(socket))
-            return;
-        std::this_thread::sleep_for(10ms);
-    }
-    throw std::runtime_error("no bus at " + socket.string());
+    if (!comesTrue([&] { return takesConnections(socket); }, 5s))
+        throw std::runtime_error("no bus at " + socket.string());
 }
 
 }  // namespace
@@ -90,15 +86,15 @@ void waitForService(const char* name, const RunningProgram& program) {
     using namespace std::chrono_literals;
     constexpr DBusMethod kHasOwner{Bus::System, "org.freedesktop.DBus", "/org/freedesktop/DBus",
                                    "org.freedesktop.DBus", "NameHasOwner"};
-    for (int i = 0; i < 1000; ++i, std::this_thread::sleep_for(10ms)) {
+    const auto isThere = [&] {
         const auto answer = callDBus(kHasOwner, g_variant_new("(s)", name), "(b)", 2s);
-        gboolean isThere = FALSE;
+        gboolean hasOwner = FALSE;
         if (answer.reply)
-            g_variant_get(answer.reply.get(), "(b)", &isThere);
-        if (isThere != FALSE)
-            return;
-    }
-    throw std::runtime_error(std::string("no ") + name + ": " + program.standardError());
+            g_variant_get(answer.reply.get(), "(b)", &hasOwner);
+        return hasOwner != FALSE;
+    };
+    if (!comesTrue(isThere, 10s))
+        throw std::runtime_error(std::string("no ") + name + ": " + program.standardError());
 }
 
 }  // namespace ventras

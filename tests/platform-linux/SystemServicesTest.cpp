@@ -13,6 +13,7 @@
 #include "platform/linux/ProcProcessTable.h"
 #include "platform/linux/Syslog.h"
 #include "tests/fakes/FakePlatform.h"
+#include "tests/parts/ComesTrue.h"
 #include "tests/parts/Program.h"
 #include "tests/parts/TemporaryFolder.h"
 
@@ -70,10 +71,8 @@ TEST(ProcProcessTable, FindsAProcessByItsExactName) {
     std::filesystem::create_symlink("/bin/sleep", program);
     RunningProgram sleeper({program.string(), "30"});
     ProcProcessTable table;
-    std::optional<pid_t> found;
-    for (int i = 0; i < 200 && !found; ++i, std::this_thread::sleep_for(10ms))
-        found = table.processNamed("lin-sleeper");
-    EXPECT_EQ(found, sleeper.pid());
+    comesTrue([&] { return table.processNamed("lin-sleeper").has_value(); }, 2s);
+    EXPECT_EQ(table.processNamed("lin-sleeper"), sleeper.pid());
     EXPECT_EQ(table.processNamed("lin-sleepe"), std::nullopt);
     EXPECT_EQ(table.processNamed("LIN-SLEEPER"), std::nullopt);
     sleeper.end();

@@ -4,8 +4,8 @@
 
 #include <chrono>
 #include <optional>
-#include <thread>
 
+#include "tests/parts/ComesTrue.h"
 #include "tests/parts/ScriptedPrinter.h"
 
 namespace ventras {
@@ -67,10 +67,8 @@ TEST_F(IdleConnectionsTest, AreHungUpAfterAWhileWhetherOrNotAnybodyLooks) {
     const auto* const watched = made.get();
     idle.keep(peer(printer.port()), std::move(made));
     // It stays with its owner until somebody calls, only its socket is shut down.
-    const auto end = std::chrono::steady_clock::now() + 3 * IdleConnections::kLongestRest;
-    while (!hasEnded(const_cast<http_t*>(watched)) && std::chrono::steady_clock::now() < end)
-        std::this_thread::sleep_for(10ms);
-    EXPECT_TRUE(hasEnded(const_cast<http_t*>(watched)));
+    EXPECT_TRUE(
+        comesTrue([&] { return hasEnded(const_cast<http_t*>(watched)); }, 3 * IdleConnections::kLongestRest));
     EXPECT_EQ(idle.take(peer(printer.port())), nullptr);
 }
 

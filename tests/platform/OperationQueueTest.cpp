@@ -9,6 +9,8 @@
 #include <latch>
 #include <semaphore>
 
+#include "tests/parts/ComesTrue.h"
+
 namespace ventras {
 namespace {
 
@@ -171,9 +173,7 @@ TEST(OperationQueue, ReleasesAnOperationThatHasFinished) {
     }
     queue.addOperation(work([&] { done.count_down(); }));
     done.wait();
-    for (int i = 0; i < 500 && !watched.expired(); ++i)
-        std::this_thread::sleep_for(10ms);
-    EXPECT_TRUE(watched.expired());
+    EXPECT_TRUE(comesTrue([&] { return watched.expired(); }, 5s));
 }
 
 TEST(OperationQueue, EndsWithTheOperationsThatAreRunning) {

@@ -4,8 +4,8 @@
 #include <csignal>
 #include <optional>
 #include <string>
-#include <thread>
 
+#include "tests/parts/ComesTrue.h"
 #include "tests/parts/PrivateScheduler.h"
 #include "tests/parts/StockUsbBackend.h"
 #include "tests/parts/UsbBench.h"
@@ -120,8 +120,7 @@ TEST_P(RunScript, FindsAShorterPlaceForASocketThatNobodyCouldReach) {
     // It takes its socket away itself; what is left of the folder goes afterwards.
     const auto folder = fs::read_symlink(far / "ventrasagent/cups/socket-folder");
     kill(scheduler, SIGTERM);
-    for (int i = 0; i < 500 && fs::exists(folder / "cups.sock"); ++i)
-        std::this_thread::sleep_for(std::chrono::milliseconds(10));
+    comesTrue([&] { return !fs::exists(folder / "cups.sock"); }, std::chrono::seconds(5));
     fs::remove_all(folder);
 }
 

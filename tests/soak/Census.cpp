@@ -5,9 +5,9 @@
 #include <filesystem>
 #include <iterator>
 #include <system_error>
-#include <thread>
 
 #include "platform/IdleConnections.h"
+#include "tests/parts/ComesTrue.h"
 
 namespace ventras {
 namespace {
@@ -34,11 +34,12 @@ Census Census::take() {
 }
 
 Census Census::takeWhenAtMost(const Census& other) {
-    auto census = take();
-    for (int i = 0; i < 400 && census.exceeds(other); ++i) {
-        std::this_thread::sleep_for(std::chrono::milliseconds(10));
+    Census census;
+    const auto isNoMore = [&] {
         census = take();
-    }
+        return !census.exceeds(other);
+    };
+    comesTrue(isNoMore, std::chrono::seconds(4));
     return census;
 }
 

@@ -9,6 +9,7 @@
 #include "drivers/PPDManager.h"
 #include "platform/linux/LinuxPlatform.h"
 #include "queues/QueueMaker.h"
+#include "tests/parts/ComesTrue.h"
 #include "tests/parts/OpenedPpd.h"
 #include "tests/soak/Census.h"
 
@@ -180,10 +181,7 @@ void RoundRun::runInProcess() {
             ++ended;
         });
     happenUntilEnd([&](std::chrono::milliseconds limit) {
-        const auto end = Clock::now() + limit;
-        while (ended < workers.size() && Clock::now() < end)
-            std::this_thread::sleep_for(2ms);
-        return ended == workers.size();
+        return comesTrue([&] { return ended == workers.size(); }, limit);
     });
     workers.clear();
     for (std::size_t i = 0; i < devices_.size(); ++i) {

@@ -8,9 +8,9 @@
 #include <chrono>
 #include <random>
 #include <string>
-#include <thread>
 
 #include "devices/UsbInterfaceReader.h"
+#include "tests/parts/ComesTrue.h"
 #include "tests/parts/UsbBench.h"
 #include "tests/usb/AttachedPrinters.h"
 #include "tests/usb/FakeUsbRegistry.h"
@@ -80,13 +80,10 @@ TEST_F(Libusb, SeesPrintersComeAndGo) {
     bench.plugIn("1-1");
     EXPECT_THAT(places(), ElementsAre(std::pair{0x01100000, 0}));
     bench.plugIn("1-2");
-    const auto deadline = std::chrono::steady_clock::now() + 5s;
-    while (places().size() < 2 && std::chrono::steady_clock::now() < deadline)
-        std::this_thread::sleep_for(5ms);
+    comesTrue([&] { return places().size() >= 2; }, 5s);
     EXPECT_THAT(places(), ElementsAre(std::pair{0x01100000, 0}, std::pair{0x01200000, 0}));
     bench.unplug("1-1");
-    while (places().size() > 1 && std::chrono::steady_clock::now() < deadline)
-        std::this_thread::sleep_for(5ms);
+    comesTrue([&] { return places().size() <= 1; }, 5s);
     EXPECT_THAT(places(), ElementsAre(std::pair{0x01200000, 0}));
 }
 
@@ -105,9 +102,7 @@ TEST_F(Libusb, OpensOnlyTheDeviceThatIsAskedAndClosesItAgain) {
     EXPECT_TRUE(firstDeviceID());
     EXPECT_EQ(bench.node("1-1").timesOpened(), 1);
     EXPECT_EQ(bench.node("1-2").timesOpened(), 0);
-    const auto deadline = std::chrono::steady_clock::now() + 5s;
-    while (bench.node("1-1").openAtPresent() > 0 && std::chrono::steady_clock::now() < deadline)
-        std::this_thread::sleep_for(1ms);
+    comesTrue([&] { return bench.node("1-1").openAtPresent() == 0; }, 5s);
     EXPECT_EQ(bench.node("1-1").openAtPresent(), 0);
 }
 

@@ -12,6 +12,7 @@
 #include <thread>
 
 #include "tests/fakes/FakePlatform.h"
+#include "tests/parts/ComesTrue.h"
 #include "tests/parts/PostScriptInterpreter.h"
 #include "tests/parts/TemporaryFolder.h"
 #include "tests/parts/UsbBench.h"
@@ -64,9 +65,7 @@ protected:
     /// Whether everything was given back: no claim, no open node, the kernel's driver in its place.
     void expectGivenBack(const std::string& place = "1-4", const std::string& driver = "usblp") {
         auto& node = bench.node(place);
-        const auto deadline = std::chrono::steady_clock::now() + 5s;
-        while (node.openAtPresent() > 0 && std::chrono::steady_clock::now() < deadline)
-            std::this_thread::sleep_for(1ms);
+        comesTrue([&] { return node.openAtPresent() == 0; }, 5s);
         EXPECT_EQ(node.openAtPresent(), 0);
         EXPECT_FALSE(node.isClaimed(0));
         EXPECT_EQ(node.driver(0), driver);
@@ -369,10 +368,7 @@ TEST_F(UsbAutoSelect, GivesThePrinterBackWhenTheProcessIsToldToEnd) {
         execl("/proc/self/exe", "ventras-usb-test", "--ask-product", kPostScriptURI, nullptr);
         _exit(127);
     }
-    const auto deadline = std::chrono::steady_clock::now() + 20s;
-    while (!node.isClaimed(0) && std::chrono::steady_clock::now() < deadline)
-        std::this_thread::sleep_for(5ms);
-    ASSERT_TRUE(node.isClaimed(0)) << "the other process never began";
+    ASSERT_TRUE(comesTrue([&] { return node.isClaimed(0); }, 20s)) << "the other process never began";
     const auto told = std::chrono::steady_clock::now();
     kill(child, SIGTERM);
     int result = 0;
