@@ -12,6 +12,11 @@ namespace {
 
 using namespace std::chrono_literals;
 
+TEST(Environment, OfSeveralPartsHasTheFirstOfEachName) {
+    const Environment all{{"A", "1"}, {"B", "2"}, {"C", "4"}};
+    EXPECT_EQ(together({{{"A", "1"}, {"B", "2"}}, {}, {{"B", "3"}, {"C", "4"}}}), all);
+}
+
 TEST(Program, TellsStatusOutputAndErrorsApart) {
     const auto run = runProgram({"sh", "-c", "echo out; echo err >&2; exit 7"});
     EXPECT_EQ(run.exitStatus, 7);
