@@ -38,14 +38,11 @@ GDBusCallFlags flagsOf(DBusCallMode mode) {
 
 }  // namespace
 
-CancelAtDeadline::CancelAtDeadline(Deadline deadline) : cancellable_(g_cancellable_new()) {
-    watcher_ = std::jthread([this, deadline](const std::stop_token& stop) {
-        std::unique_lock lock(mutex_);
-        stopped_.wait_until(lock, stop, deadline.moment(), [] { return false; });
-        if (!stop.stop_requested())
-            g_cancellable_cancel(cancellable_.get());
-    });
-}
+CancelAtDeadline::CancelAtDeadline(Deadline deadline)
+    : cancellable_(g_cancellable_new()), alarm_(deadline, [cancellable = cancellable_.get()] {
+          g_cancellable_cancel(cancellable);
+          return Alarm::Afterwards::Silent;
+      }) {}
 
 DBusConnection::DBusConnection(Bus bus, std::chrono::milliseconds limit) {
     if (!isBusThere(bus)) {

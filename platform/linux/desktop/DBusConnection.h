@@ -1,11 +1,9 @@
 #pragma once
 
 #include <chrono>
-#include <condition_variable>
-#include <mutex>
 #include <string>
-#include <thread>
 
+#include "platform/Alarm.h"
 #include "platform/Deadline.h"
 #include "platform/linux/desktop/DBusCall.h"
 #include "platform/linux/desktop/GObjectPtr.h"
@@ -22,9 +20,7 @@ public:
 
 private:
     GObjectPtr<GCancellable> cancellable_;
-    std::mutex mutex_;
-    std::condition_variable_any stopped_;
-    std::jthread watcher_;
+    Alarm alarm_;
 };
 
 /// A connection of one's own to a message bus, closed with its owner. GLib's shared ones outlive a bus that

@@ -4,8 +4,9 @@
 
 #include <algorithm>
 #include <array>
-#include <cctype>
 #include <string_view>
+
+#include "deviceid/TextScan.h"
 
 namespace ventras {
 namespace {
@@ -15,10 +16,7 @@ constexpr std::string_view kClearLine = "\r\033[K";
 constexpr std::size_t kLongestLine = 1024;
 
 bool saysYes(std::string_view line) {
-    std::string word;
-    for (const char character : line)
-        if (std::isspace(static_cast<unsigned char>(character)) == 0)
-            word += static_cast<char>(std::tolower(static_cast<unsigned char>(character)));
+    const auto word = TextScan::lowerCased(TextScan::trimmedOfLineEnds(line));
     return std::ranges::find(kYes, word) != kYes.end();
 }
 
