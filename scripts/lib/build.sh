@@ -11,11 +11,11 @@ build_preset() {
     cmake --build --preset "$preset" ${1:+--target "$@"} >&2 || die "preset $preset did not build"
 }
 
-# test_preset PRESET [ARG...]: every test of the preset; arguments go to ctest. Two at a time for each processor: they wait
+# test_preset PRESET [ARG...]: every test of the preset; arguments go to ctest. Four at a time for each processor: they wait
 # for schedulers and printers most of the time.
 test_preset() {
     local preset=$1
     shift
     cd "$source_dir" || die "cannot enter $source_dir"
-    PATH=$PATH:/usr/sbin:/sbin ctest --preset "$preset" --output-on-failure -j "$((2 * $(nproc)))" "$@"
+    PATH=$PATH:/usr/sbin:/sbin ctest --preset "$preset" --output-on-failure -j "$((4 * $(nproc)))" "$@"
 }
