@@ -17,6 +17,9 @@ namespace {
 
 using namespace ventras;
 
+// As shells have it: none of the agent's own.
+constexpr int kCannotRun = 127;
+
 /// A number that the kernel tells of a device; -1 when it does not.
 int attribute(const std::string& systemPath, const char* name) {
     int value = -1;
@@ -57,5 +60,5 @@ int main(int argc, char* argv[]) {
     pointers.push_back(nullptr);
     execv(pointers[0], pointers.data());
     std::perror(pointers[0]);
-    return 1;
+    return kCannotRun;
 }

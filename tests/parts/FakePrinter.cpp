@@ -14,8 +14,19 @@
 namespace ventras {
 namespace {
 
+// The endpoints of interface 0; each interface has its own, which all its settings share.
 constexpr std::uint8_t kBulkOut = 0x01;
 constexpr std::uint8_t kBulkIn = 0x82;
+
+constexpr std::uint8_t kIppOverUsb = 4;
+
+constexpr std::uint8_t bulkOutOf(std::uint8_t interface) {
+    return static_cast<std::uint8_t>(kBulkOut + 2 * interface);
+}
+
+constexpr std::uint8_t bulkInOf(std::uint8_t interface) {
+    return static_cast<std::uint8_t>(kBulkIn + 2 * interface);
+}
 
 std::uint8_t low(std::size_t value) {
     return static_cast<std::uint8_t>(value & 0xFFU);
@@ -105,7 +116,8 @@ UsbBytes FakePrinter::configurationDescriptor() const {
         append(bytes, {9, 4, setting.interface, setting.alternate, endpoints, setting.interfaceClass,
                        setting.subClass, setting.protocol, 0});
         if (endpoints != 0)
-            append(bytes, {7, 5, kBulkOut, 2, 0, 2, 0, 7, 5, kBulkIn, 2, 0, 2, 0});
+            append(bytes, {7, 5, bulkOutOf(setting.interface), 2, 0, 2, 0, 7, 5, bulkInOf(setting.interface),
+                           2, 0, 2, 0});
     }
     const std::array<std::uint8_t, 9> header{9,
                                              2,
@@ -195,14 +207,27 @@ UsbAnswer FakePrinter::control(const UsbSetup& setup) {
     return reply;
 }
 
+const FakeUsbSetting* FakePrinter::settingAt(std::uint8_t endpoint) const {
+    for (const auto& candidate : model_.settings)
+        if (isPrinter(candidate) && candidate.alternate == settingInUse(candidate.interface) &&
+            (endpoint == bulkOutOf(candidate.interface) || endpoint == bulkInOf(candidate.interface)))
+            return &candidate;
+    return nullptr;
+}
+
+std::string FakePrinter::reaction(const FakeUsbSetting& at, std::string_view data) {
+    return at.protocol == kIppOverUsb ? http(at.interface, data) : interpreter(data);
+}
+
 UsbAnswer FakePrinter::bulkOut(std::uint8_t endpoint, std::string_view data) {
     const std::lock_guard lock(mutex_);
     if (auto faulty = bulkFault(endpoint))
         return std::move(*faulty);
-    if (endpoint != kBulkOut)
+    const auto* at = settingAt(endpoint);
+    if (at == nullptr)
         return UsbAnswer::stall();
     received_ += data;
-    toSend_ += interpreter(data);
+    toSend_[at->interface] += reaction(*at, data);
     return {};
 }
 
@@ -210,14 +235,16 @@ std::optional<UsbAnswer> FakePrinter::bulkIn(std::uint8_t endpoint, std::size_t 
     const std::lock_guard lock(mutex_);
     if (auto faulty = bulkFault(endpoint))
         return faulty;
-    if (endpoint != kBulkIn)
+    const auto* at = settingAt(endpoint);
+    if (at == nullptr)
         return UsbAnswer::stall();
-    if (toSend_.empty())
-        toSend_ += interpreter({});
-    if (toSend_.empty())
+    auto& toSend = toSend_[at->interface];
+    if (toSend.empty())
+        toSend += reaction(*at, {});
+    if (toSend.empty())
         return std::nullopt;
-    auto sent = UsbAnswer::text(std::string_view(toSend_).substr(0, most));
-    toSend_.erase(0, sent.data.size());
+    auto sent = UsbAnswer::text(std::string_view(toSend).substr(0, most));
+    toSend.erase(0, sent.data.size());
     return sent;
 }
 

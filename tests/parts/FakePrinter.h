@@ -79,8 +79,11 @@ public:
     /// The same for bulk transfers; its argument is the endpoint address.
     Hook<std::optional<UsbAnswer>(std::uint8_t)> bulkFault;
 
-    /// Takes what arrives at the bulk endpoint and gives what the device says to it.
+    /// Takes what arrives at a bulk endpoint and gives what the device says to it; asked with nothing, too.
     Hook<std::string(std::string_view)> interpreter;
+
+    /// The same for settings of IPP over USB; its first argument is the interface.
+    Hook<std::string(std::uint8_t, std::string_view)> http;
 
     const FakePrinterModel& model() const { return model_; }
 
@@ -107,13 +110,15 @@ private:
     UsbAnswer descriptor(const UsbSetup& setup) const;
     UsbBytes stringDescriptor(std::uint8_t index) const;
     std::uint8_t settingInUse(std::uint8_t interface) const;
+    const FakeUsbSetting* settingAt(std::uint8_t endpoint) const;
+    std::string reaction(const FakeUsbSetting& at, std::string_view data);
 
     FakePrinterModel model_;
     mutable std::mutex mutex_;
     std::map<std::uint8_t, std::uint8_t> currentSettings_;
     std::vector<UsbSetup> requests_;
     std::string received_;
-    std::string toSend_;
+    std::map<std::uint8_t, std::string> toSend_;  // by interface
 };
 
 /// What ends the raster graphics of a page in PCL.

@@ -49,7 +49,7 @@ TEST(Hotplug, SaysWhatIsWrong) {
     EXPECT_EQ(runProgram({VENTRAS_HOTPLUG_PROGRAM}).exitStatus, 2);
     EXPECT_EQ(runProgram({VENTRAS_HOTPLUG_PROGRAM, bench.sysPath("1-1")}).exitStatus, 2);
     const auto run = runProgram({VENTRAS_HOTPLUG_PROGRAM, bench.sysPath("1-1"), "/no/such/program"});
-    EXPECT_EQ(run.exitStatus, 1);
+    EXPECT_EQ(run.exitStatus, 127);
     EXPECT_THAT(run.standardError, HasSubstr("/no/such/program"));
 }
 

@@ -1,0 +1,91 @@
+#include <gmock/gmock.h>
+
+#include <chrono>
+#include <memory>
+#include <string>
+
+#include "tests/kernel/VhciPort.h"
+#include "tests/machine/HttpOverUsb.h"
+#include "tests/machine/Machine.h"
+#include "tests/parts/ComesTrue.h"
+#include "tests/parts/Program.h"
+#include "tests/parts/VirtualPrinter.h"
+
+namespace ventras {
+namespace {
+
+using namespace std::chrono_literals;
+using testing::IsEmpty;
+
+constexpr const char* kID = "MFG:HP;MDL:HP LaserJet;CMD:PCL;SN:M1;";
+constexpr const char* kURI = "usb://HP/HP%20LaserJet?serial=M1";
+
+// An emulated processor is slow.
+constexpr auto kLimit = 180s;
+
+// What systemd says at the end of each run of the agent that it takes for a good one.
+constexpr const char* kGoodEnd = "Deactivated successfully";
+
+class PluggedIn : public testing::Test {
+protected:
+    static bool ends(long more) {
+        return comesTrue([&] { return Machine::timesInJournal(kGoodEnd) >= more; }, kLimit);
+    }
+
+    void TearDown() override { EXPECT_THAT(Machine::failedUnits(), IsEmpty()) << Machine::journal(); }
+
+    long endsBefore = Machine::timesInJournal(kGoodEnd);
+};
+
+TEST_F(PluggedIn, PrinterHasAQueueThatPrints) {
+    VhciPort port({.deviceID = kID});
+    ASSERT_TRUE(ends(endsBefore + 1)) << Machine::journal();
+    const auto queue = Machine::queueOf(kURI);
+    ASSERT_NE(queue, "") << Machine::journal();
+    const auto lp = runProgram({"lp", "-d", queue, "/etc/hostname"});
+    EXPECT_EQ(lp.exitStatus, 0) << lp.standardError;
+    EXPECT_TRUE(port.printer().receives(kEndOfPclPage, kLimit));
+}
+
+TEST_F(PluggedIn, PrinterHasOneQueueHoweverOftenItComesBack) {
+    for (int i = 1; i <= 2; ++i) {
+        const VhciPort port({.deviceID = kID});
+        ASSERT_TRUE(ends(endsBefore + i)) << Machine::journal();
+    }
+    EXPECT_EQ(Machine::queues().size(), 1U);
+    EXPECT_NE(Machine::queueOf(kURI), "");
+}
+
+TEST_F(PluggedIn, PrinterWithoutADriverIsNoFailureOfAService) {
+    const auto before = Machine::queues();
+    const VhciPort port({.deviceID = "MFG:Acme;MDL:Winjet;CMD:GDI;SN:M2;"});
+    ASSERT_TRUE(ends(endsBefore + 1)) << Machine::journal();
+    EXPECT_EQ(Machine::queues(), before);
+}
+
+TEST_F(PluggedIn, PrinterWithIppOverUsbHasAQueueThatPrints) {
+    const VirtualPrinter inside({.name = "Inside", .make = "Acme", .model = "Laser"});
+    VhciPort port({.deviceID = "MFG:Acme;MDL:Laser;CMD:PDF,URF;SN:M3;",
+                   .manufacturer = "Acme",
+                   .productName = "Laser",
+                   .serialNumber = "M3",
+                   .settings = {{0, 0, 7, 1, 2}, {0, 1, 7, 1, 4}, {1, 0, 255, 0, 0}, {1, 1, 7, 1, 4}}});
+    const auto wire = std::make_shared<HttpOverUsb>(inside.port());
+    port.printer().http = [wire](std::uint8_t interface, std::string_view data) {
+        return (*wire)(interface, data);
+    };
+    std::string queue;
+    const auto hasAQueue = [&] {
+        for (const auto& [name, uri] : Machine::queues())
+            if (uri.starts_with("ippusb://"))
+                queue = name;
+        return !queue.empty();
+    };
+    ASSERT_TRUE(comesTrue(hasAQueue, kLimit)) << Machine::journal();
+    const auto lp = runProgram({"lp", "-d", queue, "/etc/hostname"});
+    EXPECT_EQ(lp.exitStatus, 0) << lp.standardError;
+    EXPECT_TRUE(inside.receivedWithin(kLimit)) << inside.log();
+}
+
+}  // namespace
+}  // namespace ventras
