@@ -3,6 +3,8 @@
 #include <chrono>
 #include <memory>
 #include <string>
+#include <string_view>
+#include <vector>
 
 #include "tests/kernel/VhciPort.h"
 #include "tests/machine/HttpOverUsb.h"
@@ -15,6 +17,7 @@ namespace ventras {
 namespace {
 
 using namespace std::chrono_literals;
+using testing::ElementsAre;
 using testing::IsEmpty;
 
 constexpr const char* kID = "MFG:HP;MDL:HP LaserJet;CMD:PCL;SN:M1;";
@@ -63,28 +66,57 @@ TEST_F(PluggedIn, PrinterWithoutADriverIsNoFailureOfAService) {
     EXPECT_EQ(Machine::queues(), before);
 }
 
-TEST_F(PluggedIn, PrinterWithIppOverUsbHasAQueueThatPrints) {
-    const VirtualPrinter inside({.name = "Inside", .make = "Acme", .model = "Laser"});
-    VhciPort port({.deviceID = "MFG:Acme;MDL:Laser;CMD:PDF,URF;SN:M3;",
-                   .manufacturer = "Acme",
-                   .productName = "Laser",
-                   .serialNumber = "M3",
-                   .settings = {{0, 0, 7, 1, 2}, {0, 1, 7, 1, 4}, {1, 0, 255, 0, 0}, {1, 1, 7, 1, 4}}});
-    const auto wire = std::make_shared<HttpOverUsb>(inside.port());
-    port.printer().http = [wire](std::uint8_t interface, std::string_view data) {
-        return (*wire)(interface, data);
-    };
-    std::string queue;
-    const auto hasAQueue = [&] {
+TEST_F(PluggedIn, PrinterIsThereBeforeThePackage) {
+    ASSERT_EQ(runProgram({"dpkg", "--remove", "ventrasagent"}, {}, kLimit).exitStatus, 0);
+    const VhciPort port({.deviceID = "MFG:HP;MDL:HP LaserJet;CMD:PCL;SN:M4;"});
+    const auto installed =
+        runProgram({"sh", "-c", "dpkg --install /package/ventrasagent_*-1_*.deb"}, {}, kLimit);
+    ASSERT_EQ(installed.exitStatus, 0) << installed.standardError;
+    ASSERT_TRUE(ends(endsBefore + 1)) << Machine::journal();
+    EXPECT_NE(Machine::queueOf("usb://HP/HP%20LaserJet?serial=M4"), "") << Machine::journal();
+}
+
+// A printer with IPP over USB, as many are: the older protocol comes first, and has to be left.
+class PluggedInWithIppOverUsb : public PluggedIn {
+protected:
+    std::unique_ptr<VhciPort> plugIn() const {
+        auto port = std::make_unique<VhciPort>(FakePrinterModel{
+            .deviceID = "MFG:Acme;MDL:Laser;CMD:PDF,URF;SN:M3;",
+            .manufacturer = "Acme",
+            .productName = "Laser",
+            .serialNumber = "M3",
+            .settings = {{0, 0, 7, 1, 2}, {0, 1, 7, 1, 4}, {1, 0, 255, 0, 0}, {1, 1, 7, 1, 4}}});
+        port->printer().http = [wire = std::make_shared<HttpOverUsb>(inside.port())](std::uint8_t interface,
+                                                                                     std::string_view data) {
+            return (*wire)(interface, data);
+        };
+        return port;
+    }
+
+    /// The queues of all such printers.
+    static std::vector<std::string> queues() {
+        std::vector<std::string> names;
         for (const auto& [name, uri] : Machine::queues())
             if (uri.starts_with("ippusb://"))
-                queue = name;
-        return !queue.empty();
-    };
-    ASSERT_TRUE(comesTrue(hasAQueue, kLimit)) << Machine::journal();
-    const auto lp = runProgram({"lp", "-d", queue, "/etc/hostname"});
-    EXPECT_EQ(lp.exitStatus, 0) << lp.standardError;
-    EXPECT_TRUE(inside.receivedWithin(kLimit)) << inside.log();
+                names.push_back(name);
+        return names;
+    }
+
+    VirtualPrinter inside{{.name = "Inside", .make = "Acme", .model = "Laser"}};
+};
+
+TEST_F(PluggedInWithIppOverUsb, PrinterHasAQueueThatPrintsAgainWhenItComesBack) {
+    auto port = plugIn();
+    ASSERT_TRUE(comesTrue([] { return !queues().empty(); }, kLimit)) << Machine::journal();
+    const auto queue = queues().front();
+    for (std::size_t documents : {1U, 2U}) {
+        const auto lp = runProgram({"lp", "-d", queue, "/etc/hostname"});
+        EXPECT_EQ(lp.exitStatus, 0) << lp.standardError;
+        EXPECT_TRUE(inside.receivedWithin(kLimit, documents)) << inside.log() << Machine::journal();
+        port.reset();
+        port = plugIn();
+    }
+    EXPECT_THAT(queues(), ElementsAre(queue));
 }
 
 }  // namespace
