@@ -11,6 +11,28 @@ readonly kernel=$source_dir/build/kernel
 work=    # what is only needed meanwhile
 machine= # the process
 
+filter='*'
+acceleration=
+programs=
+
+# take_arguments ARGUMENT...: those of the scripts, [--filter FILTER] [--accel kvm|tcg] PROGRAM-FOLDER
+# shellcheck disable=SC2034 # they are for the scripts
+take_arguments() {
+    while (($# > 1)); do
+        case $1 in
+            --filter) filter=$2 ;;
+            --accel) acceleration=$2 ;;
+            *) break ;;
+        esac
+        shift 2
+    done
+    if [[ $# -ne 1 || ! $acceleration =~ ^(kvm|tcg)?$ ]]; then
+        printf 'Usage: %s [--filter FILTER] [--accel kvm|tcg] PROGRAM-FOLDER\n' "${0##*/}" >&2
+        exit 2
+    fi
+    programs=$1
+}
+
 # begin_machine FOLDER: FOLDER is where the work is done, and goes with the script, whichever way that ends.
 begin_machine() {
     [[ $(dpkg --print-architecture) == amd64 ]] || die "knows the kernel of amd64 only"
@@ -96,17 +118,17 @@ kvm_works() {
     ((status == 0x15 * 2 + 1))
 }
 
-# boot ACCELERATION LIMIT ROOT [KERNEL-ARGUMENT...]: with tcg, kvm, or "" for what works, for as many seconds. What the guest
-# writes to its serial ports comes out here, but for the console and the status.
+# boot SECONDS ROOT [KERNEL-ARGUMENT...]: for so long at most. What the guest writes to its serial ports comes out here, but
+# for the console and the status.
 boot() {
-    local acceleration=$1 seconds=$2 root=$3
+    local seconds=$1 root=$2
     local -a processor=(-accel kvm -cpu host)
     if [[ $acceleration == tcg ]] || { [[ -z $acceleration ]] && ! kvm_works; }; then
         processor=(-accel tcg)
     fi
     timeout -k 10 "$seconds" qemu-system-x86_64 "${processor[@]}" -smp 2 -m 1024 -nodefaults -no-user-config -display none \
         -no-reboot -kernel "$kernel/vmlinux" -initrd "$work/initramfs.cpio" \
-        -append "console=ttyS0 quiet panic=-1 nokaslr mitigations=off ${*:4}" \
+        -append "console=ttyS0 quiet panic=-1 nokaslr mitigations=off ${*:3}" \
         -virtfs "local,path=$root,mount_tag=host,readonly=on,security_model=none,multidevs=remap" \
         -serial "file:$work/console" -serial stdio -serial "file:$work/status" </dev/null &
     machine=$!
