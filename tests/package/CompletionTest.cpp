@@ -10,12 +10,11 @@ namespace {
 
 using testing::ElementsAre;
 using testing::IsEmpty;
-using testing::IsSupersetOf;
 
 constexpr const char* kAgentOptions[] = {"--download", "--skerrow", "--scanner", "-u", "-s"};
 
 /// What bash offers for the last word of a command line that is made of these.
-Words completed(std::vector<std::string> words, const std::string& folder = "/") {
+Words offeredByBash(std::vector<std::string> words, const std::string& folder = "/") {
     // Outside of an interactive shell nobody can be told how to complete further.
     const std::string script =
         "compopt() { :; }; program=$0; . " VENTRAS_COMPLETIONS
@@ -29,12 +28,12 @@ Words completed(std::vector<std::string> words, const std::string& folder = "/")
 }
 
 TEST(BashCompletion, OffersTheCommandsOfTheTool) {
-    EXPECT_EQ(completed({"ventrasctl", ""}), toolCommands());
-    EXPECT_THAT(completed({"ventrasctl", "--json", "dev"}), ElementsAre("device-id"));
+    EXPECT_EQ(offeredByBash({"ventrasctl", ""}), toolCommands());
+    EXPECT_THAT(offeredByBash({"ventrasctl", "--json", "dev"}), ElementsAre("device-id"));
 }
 
 TEST(BashCompletion, OffersTheOptionsOfTheTool) {
-    EXPECT_EQ(completed({"ventrasctl", "--"}), toolOptions());
+    EXPECT_EQ(offeredByBash({"ventrasctl", "--"}), toolOptions());
 }
 
 TEST(BashCompletion, OffersTheOptionsOfEachCommand) {
@@ -42,7 +41,7 @@ TEST(BashCompletion, OffersTheOptionsOfEachCommand) {
         auto options = toolOptions(command);
         if (command == "explain")
             options.insert(std::begin(kAgentOptions), std::end(kAgentOptions));
-        EXPECT_EQ(completed({"ventrasctl", command, "-"}), options) << command;
+        EXPECT_EQ(offeredByBash({"ventrasctl", command, "-"}), options) << command;
     }
 }
 
@@ -56,44 +55,73 @@ TEST(BashCompletion, OffersFilesWhereFilesAreWanted) {
                                                {"ventrasctl", "match", "--catalogue", "o"},
                                                {"ventrasctl", "match", "--catalogue", "=", "o"},
                                                {"ventrasctl", "catalogue", "build", "o"}})
-        EXPECT_THAT(completed(words, folder.path()), ElementsAre("one.ppd"));
-    EXPECT_THAT(completed({"ventrasctl", "match", "--catalogue", "="}, folder.path()),
+        EXPECT_THAT(offeredByBash(words, folder.path()), ElementsAre("one.ppd"));
+    EXPECT_THAT(offeredByBash({"ventrasctl", "match", "--catalogue", "="}, folder.path()),
                 ElementsAre("one.ppd", "two.ppd"));
 }
 
 TEST(BashCompletion, OffersNothingForATextOfTheDevices) {
-    EXPECT_THAT(completed({"ventrasctl", "match", "--model", ""}), IsEmpty());
-    EXPECT_THAT(completed({"ventrasctl", "device-id", ""}), IsEmpty());
+    EXPECT_THAT(offeredByBash({"ventrasctl", "match", "--model", ""}), IsEmpty());
+    EXPECT_THAT(offeredByBash({"ventrasctl", "device-id", ""}), IsEmpty());
 }
 
 TEST(BashCompletion, OffersWhatTheAgentTakes) {
-    auto offered = completed({"ventrasagent", "-"});
+    auto offered = offeredByBash({"ventrasagent", "-"});
     EXPECT_THAT(offered, testing::UnorderedElementsAreArray(kAgentOptions));
-    offered.merge(completed({"ventrasagent", ""}));
+    offered.merge(offeredByBash({"ventrasagent", ""}));
     for (const auto& argument : offered)
         EXPECT_NE(parseArgument(argument).kind, ArgumentKind::Ignored) << argument;
-    EXPECT_THAT(completed({"ventrasagent", "-u1,0", "ipps"}), ElementsAre("ipps://"));
+    EXPECT_THAT(offeredByBash({"ventrasagent", "-u1,0", "ipps"}), ElementsAre("ipps://"));
 }
 
-TEST(ZshCompletion, IsReadByZsh) {
-    for (const std::string program : {"ventrasctl", "ventrasagent"}) {
-        const auto result = runProgram({"zsh", "-fn", VENTRAS_COMPLETIONS "/zsh/_" + program});
-        EXPECT_EQ(result.exitStatus, 0) << result.standardError;
+/// What an interactive zsh offers for the last word of a command line.
+Words offeredByZsh(const std::string& line, const std::string& folder = "/") {
+    const TemporaryFolder answer;
+    const auto offered = answer / "offered";
+    const auto result =
+        runProgram({"zsh", "-f", VENTRAS_COMPLETE_ZSH, VENTRAS_COMPLETIONS "/zsh", offered, line},
+                   {.workingFolder = folder});
+    auto words = matchesOf(readFile(offered), "([^\n]+)\n");
+    EXPECT_EQ(words.erase("END"), 1U) << result.standardError;
+    return words;
+}
+
+TEST(ZshCompletion, OffersTheCommandsOfTheTool) {
+    EXPECT_EQ(offeredByZsh("ventrasctl "), toolCommands());
+    EXPECT_THAT(offeredByZsh("ventrasctl --json dev"), ElementsAre("device-id"));
+}
+
+TEST(ZshCompletion, OffersTheOptionsOfTheTool) {
+    EXPECT_EQ(offeredByZsh("ventrasctl --"), toolOptions());
+}
+
+TEST(ZshCompletion, OffersTheOptionsOfEachCommand) {
+    for (const auto& command : toolCommands()) {
+        auto options = toolOptions(command);
+        if (command == "explain")
+            options.insert(std::begin(kAgentOptions), std::end(kAgentOptions));
+        EXPECT_EQ(offeredByZsh("ventrasctl " + command + " -"), options) << command;
     }
 }
 
-TEST(ZshCompletion, HasTheCommandsAndOptionsOfTheTool) {
-    const auto source = readFile(VENTRAS_COMPLETIONS "/zsh/_ventrasctl");
-    EXPECT_EQ(matchesOf(source, "\n            ['\"]([a-z-]+):"), toolCommands());
-    auto options = toolOptions();
-    for (const auto& command : toolCommands())
-        options.merge(toolOptions(command));
-    EXPECT_THAT(matchesOf(source, "['*](--[a-z-]+?)-?=?\\["), IsSupersetOf(options));
+TEST(ZshCompletion, OffersFilesWhereFilesAreWanted) {
+    const TemporaryFolder folder;
+    folder.write("one.ppd", "");
+    folder.write("two.ppd", "");
+    for (const std::string line : {"ventrasctl ppd o", "ventrasctl ppd two.ppd o",
+                                   "ventrasctl match --catalogue=o", "ventrasctl match --catalogue o",
+                                   "ventrasctl catalogue --file=o", "ventrasctl catalogue --output o"})
+        EXPECT_THAT(offeredByZsh(line, folder.path()), ElementsAre("one.ppd")) << line;
 }
 
-TEST(ZshCompletion, HasWhatTheAgentTakes) {
-    const auto source = readFile(VENTRAS_COMPLETIONS "/zsh/_ventrasagent");
-    EXPECT_THAT(matchesOf(source, "'\\*(-[a-z-]+?)-?\\["), testing::UnorderedElementsAreArray(kAgentOptions));
+TEST(ZshCompletion, OffersNothingForATextOfTheDevices) {
+    EXPECT_THAT(offeredByZsh("ventrasctl match --model="), IsEmpty());
+    EXPECT_THAT(offeredByZsh("ventrasctl device-id "), IsEmpty());
+}
+
+TEST(ZshCompletion, OffersWhatTheAgentTakes) {
+    EXPECT_THAT(offeredByZsh("ventrasagent -"), testing::UnorderedElementsAreArray(kAgentOptions));
+    EXPECT_THAT(offeredByZsh("ventrasagent -u1,0 ipps"), ElementsAre("ipps://"));
 }
 
 }  // namespace
