@@ -10,11 +10,11 @@
 #include <iterator>
 #include <system_error>
 
-#include "catalogue/BoundedProgram.h"
 #include "catalogue/ControlData.h"
 #include "deviceid/TextScan.h"
 #include "drivers/PPDManager.h"
 #include "platform/FileContent.h"
+#include "platform/linux/BoundedProgram.h"
 
 namespace ventras {
 namespace {

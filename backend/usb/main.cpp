@@ -9,7 +9,7 @@
 #include "backend/StockBackend.h"
 #include "backend/usb/StockDeviceURI.h"
 #include "backend/usb/StockListing.h"
-#include "catalogue/BoundedProgram.h"
+#include "platform/linux/BoundedProgram.h"
 
 namespace ventras {
 namespace {

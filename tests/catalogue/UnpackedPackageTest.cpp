@@ -3,9 +3,9 @@
 #include <gtest/gtest.h>
 #include <sys/stat.h>
 
-#include "catalogue/BoundedProgram.h"
 #include "catalogue/ControlData.h"
 #include "platform/Handles.h"
+#include "platform/linux/BoundedProgram.h"
 #include "tests/parts/TemporaryFolder.h"
 
 namespace ventras {

@@ -1,4 +1,4 @@
-#include "catalogue/BoundedProgram.h"
+#include "platform/linux/BoundedProgram.h"
 
 #include <fcntl.h>
 #include <poll.h>
