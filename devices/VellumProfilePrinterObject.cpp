@@ -13,6 +13,7 @@
 #include "platform/IppConnection.h"
 #include "platform/Log.h"
 #include "platform/Platform.h"
+#include "platform/SeparatedURI.h"
 
 namespace ventras {
 namespace {
@@ -58,21 +59,6 @@ constexpr std::array kKeptAttributes{
     KeptAttribute{"sides-supported", IPP_TAG_KEYWORD, addDuplex, "Duplex"},
 };
 
-struct Address {
-    std::string host, resource;
-    int port = 0;
-};
-
-Address separate(const std::string& uri) {
-    std::array<char, 32> scheme{};
-    std::array<char, 256> user{};
-    std::array<char, 1024> host{}, resource{};
-    int port = 0;
-    httpSeparateURI(HTTP_URI_CODING_ALL, uri.c_str(), scheme.data(), scheme.size(), user.data(), user.size(),
-                    host.data(), host.size(), &port, resource.data(), resource.size());
-    return {host.data(), resource.data(), port};
-}
-
 IppPtr descriptionRequest(const std::string& uri) {
     IppPtr request{ippNewRequest(IPP_OP_GET_PRINTER_ATTRIBUTES)};
     ippAddString(request.get(), IPP_TAG_OPERATION, IPP_TAG_URI, "printer-uri", nullptr, uri.c_str());
@@ -116,18 +102,18 @@ void VellumProfilePrinterObject::setAttributes(DeviceDescription attributes) {
 
 void VellumProfilePrinterObject::updateAttributes() {
     const std::string uri = uri_.value_or("");
-    const auto [host, resource, port] = separate(uri);
+    const auto address = SeparatedURI::from(uri);
     attributes_.emplace();
     failure_.clear();
 
-    auto connection = IppConnection::toPrinter(host, port, cupsEncryption());
+    auto connection = IppConnection::toPrinter(address.host, address.port, cupsEncryption());
     if (!connection.connected()) {
         failure_ = "it cannot be reached: " + connection.failure();
-        platform_.log.error("-[VellumProfilePrinterObject updateAttributes]: Unable to connect to " + host +
-                            ":" + std::to_string(port) + ": " + connection.failure());
+        platform_.log.error("-[VellumProfilePrinterObject updateAttributes]: Unable to connect to " +
+                            address.host + ":" + std::to_string(address.port) + ": " + connection.failure());
         return;
     }
-    const auto answer = connection.exchange(descriptionRequest(uri), resource);
+    const auto answer = connection.exchange(descriptionRequest(uri), address.resource);
     if (answer.response)
         attributes_ = descriptionFrom(answer.response.get());
     if (!answer.succeeded())

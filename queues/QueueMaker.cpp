@@ -1,9 +1,6 @@
 #include "queues/QueueMaker.h"
 
-#include <cups/cups.h>
-
 #include <algorithm>
-#include <array>
 #include <cstdio>
 #include <string_view>
 #include <utility>
@@ -16,6 +13,7 @@
 #include "drivers/PPDManager.h"
 #include "platform/Platform.h"
 #include "platform/PrintSystemService.h"
+#include "platform/SeparatedURI.h"
 
 namespace ventras {
 namespace {
@@ -24,14 +22,10 @@ constexpr unsigned kWorstPrinterKind = PPDKind::kInstalledHpijs;
 
 // The URL names a file of this machine: "file:///path" or "file://localhost/path", with percent-escapes.
 std::optional<std::string> pathFromFileURL(const std::string& url) {
-    std::array<char, HTTP_MAX_URI> scheme{}, user{}, host{}, path{};
-    int port = 0;
-    const auto status =
-        httpSeparateURI(HTTP_URI_CODING_ALL, url.c_str(), scheme.data(), scheme.size(), user.data(),
-                        user.size(), host.data(), host.size(), &port, path.data(), path.size());
-    if (status != HTTP_URI_STATUS_OK || std::string_view(scheme.data()) != "file")
+    const auto parts = SeparatedURI::from(url);
+    if (parts.status != HTTP_URI_STATUS_OK || parts.scheme != "file")
         return std::nullopt;
-    return path.data();
+    return parts.resource;
 }
 
 }  // namespace

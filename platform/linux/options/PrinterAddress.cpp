@@ -4,6 +4,7 @@
 #include <array>
 #include <string_view>
 
+#include "platform/SeparatedURI.h"
 #include "platform/Utf8.h"
 #include "platform/linux/options/LocalServiceResolver.h"
 
@@ -20,26 +21,6 @@ constexpr auto kLocalHost = "localhost";
 // PWG 5100.14 and PWG 5100.15: the paths under which printers offer the two services.
 constexpr auto kPrintPath = "/ipp/print";
 constexpr auto kFaxOutPath = "/ipp/faxout";
-
-struct DeviceURI {
-    std::string scheme, host, resource;
-    int port = 0;
-};
-
-std::optional<DeviceURI> separate(const std::string& uri) {
-    std::array<char, 32> scheme{};
-    std::array<char, HTTP_MAX_URI> user{};
-    std::array<char, HTTP_MAX_URI> host{};
-    std::array<char, HTTP_MAX_URI> resource{};
-    int port = 0;
-    const auto size = [](const auto& buffer) { return static_cast<int>(buffer.size()); };
-    const auto status =
-        httpSeparateURI(HTTP_URI_CODING_ALL, uri.c_str(), scheme.data(), size(scheme), user.data(),
-                        size(user), host.data(), size(host), &port, resource.data(), size(resource));
-    if (status < HTTP_URI_STATUS_OK || host.front() == '\0')
-        return std::nullopt;
-    return DeviceURI{scheme.data(), host.data(), resource.data(), port};
-}
 
 std::string assembled(const PrinterAddress& address) {
     std::array<char, HTTP_MAX_URI> uri{};
@@ -66,7 +47,7 @@ bool isAnotherPrinter(const LocalService& found, std::string_view resource) {
 }
 
 // Whatever host the record names, the device hangs on this computer.
-std::optional<PrinterAddress> resolveLocal(const DeviceURI& uri, PrinterService service) {
+std::optional<PrinterAddress> resolveLocal(const SeparatedURI& uri, PrinterService service) {
     if (!uri.host.ends_with(kServiceSuffix))
         return std::nullopt;
     const auto found = resolveLocalService(uri.host.substr(0, uri.host.size() - kServiceSuffix.size()));
@@ -80,7 +61,7 @@ std::optional<PrinterAddress> resolveLocal(const DeviceURI& uri, PrinterService 
     return address;
 }
 
-PrinterAddress addressIn(const DeviceURI& uri, PrinterService service) {
+PrinterAddress addressIn(const SeparatedURI& uri, PrinterService service) {
     PrinterAddress address;
     address.host = uri.host;
     address.port = uri.port;
@@ -95,11 +76,11 @@ PrinterAddress addressIn(const DeviceURI& uri, PrinterService service) {
 }  // namespace
 
 std::optional<PrinterAddress> PrinterAddress::find(const std::string& deviceURI, PrinterService service) {
-    const auto parts = separate(deviceURI);
-    if (!parts)
+    const auto parts = SeparatedURI::from(deviceURI);
+    if (parts.status < HTTP_URI_STATUS_OK || parts.host.empty())
         return std::nullopt;
     auto address =
-        parts->scheme == "ippusb" ? resolveLocal(*parts, service) : std::optional{addressIn(*parts, service)};
+        parts.scheme == "ippusb" ? resolveLocal(parts, service) : std::optional{addressIn(parts, service)};
     if (address)
         address->uri = assembled(*address);
     return address;

@@ -1,7 +1,5 @@
 #include "platform/linux/options/UsbPrinterLocator.h"
 
-#include <cups/http.h>
-
 #include <algorithm>
 #include <array>
 #include <charconv>
@@ -12,6 +10,7 @@
 #include <vector>
 
 #include "deviceid/PMStringAdditions.h"
+#include "platform/SeparatedURI.h"
 
 namespace ventras {
 namespace {
@@ -46,15 +45,10 @@ std::optional<std::uint32_t> hexadecimal(std::string_view digits) {
 }
 
 std::optional<Wanted> wantedBy(const std::string& deviceURI) {
-    std::array<char, 32> scheme{};
-    std::array<char, 1024> user{}, host{}, resource{};
-    int port = 0;
-    const auto status =
-        httpSeparateURI(HTTP_URI_CODING_ALL, deviceURI.c_str(), scheme.data(), scheme.size(), user.data(),
-                        user.size(), host.data(), host.size(), &port, resource.data(), resource.size());
-    if (status < HTTP_URI_STATUS_OK || scheme.data() != "usb"sv)
+    const auto parts = SeparatedURI::from(deviceURI);
+    if (parts.status < HTTP_URI_STATUS_OK || parts.scheme != "usb")
         return std::nullopt;
-    std::string_view path = resource.data();
+    std::string_view path = parts.resource;
     const auto question = std::min(path.rfind('?'), path.size());
     const auto query = path.substr(std::min(question + 1, path.size()));
     path = path.substr(0, question);
