@@ -37,9 +37,8 @@ void ScriptedNotifications::offer(GDBusConnection* connection, const std::vector
             if (method == "CloseNotification") {
                 unsigned id = 0;
                 g_variant_get(arguments, "(u)", &id);
+                takeAway(id);
                 g_dbus_method_invocation_return_value(call, nullptr);
-                const std::lock_guard lock(mutex_);
-                takenAway_.push_back(id);
                 return close(id, kClosedByCall);
             }
             const auto notification = note(arguments);
@@ -72,6 +71,11 @@ ShownNotification ScriptedNotifications::note(GVariant* arguments) {
     notification.id = notification.replaces != 0 ? notification.replaces : ++lastID_;
     shown_.push_back(notification);
     return notification;
+}
+
+void ScriptedNotifications::takeAway(unsigned id) {
+    const std::lock_guard lock(mutex_);
+    takenAway_.push_back(id);
 }
 
 void ScriptedNotifications::press(unsigned id, const std::string& button) {

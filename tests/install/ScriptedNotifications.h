@@ -49,6 +49,7 @@ public:
 private:
     void offer(GDBusConnection* connection, const std::vector<std::string>& capabilities);
     ShownNotification note(GVariant* arguments);
+    void takeAway(unsigned id);
 
     Reaction reaction_;
     std::mutex mutex_;
