@@ -4,7 +4,7 @@
 
 #include "platform/Deadline.h"
 #include "platform/PrintToolAgentChannel.h"
-#include "platform/linux/desktop/GObjectPtr.h"
+#include "platform/linux/desktop/DBusConnection.h"
 #include "platform/linux/desktop/PropertyVariant.h"
 
 namespace ventras {
@@ -19,7 +19,7 @@ constexpr const char* kInterface =
     "<arg name='reply' type='a{sv}' direction='out'/>"
     "</method></interface></node>";
 
-constexpr int kBusLimit = 10'000;  // ms
+constexpr std::chrono::seconds kBusLimit{10};
 constexpr guint32 kDoNotQueue = 4;
 constexpr guint32 kIsOwner = 1;
 
@@ -61,33 +61,32 @@ gboolean onTick(gpointer) {
 constexpr GDBusInterfaceVTable kMembers{onCommand, nullptr, nullptr, {}};
 
 /// A method of the bus about our name. @return its answer, 0 when there is none.
-guint32 askBus(GDBusConnection* bus, const char* method, GVariant* arguments) {
-    const VariantPtr reply{g_dbus_connection_call_sync(
-        bus, "org.freedesktop.DBus", "/org/freedesktop/DBus", "org.freedesktop.DBus", method, arguments,
-        G_VARIANT_TYPE("(u)"), G_DBUS_CALL_FLAGS_NONE, kBusLimit, nullptr, nullptr)};
-    guint32 answer = 0;
-    if (reply)
-        g_variant_get(reply.get(), "(u)", &answer);
-    return answer;
+guint32 askBus(const DBusConnection& bus, const char* method, GVariant* arguments) {
+    const auto answer = bus.call(
+        {Bus::Session, "org.freedesktop.DBus", "/org/freedesktop/DBus", "org.freedesktop.DBus", method},
+        arguments, "(u)", kBusLimit);
+    guint32 number = 0;
+    if (answer.reply)
+        g_variant_get(answer.reply.get(), "(u)", &number);
+    return number;
 }
 
-bool offer(GDBusConnection* bus, Serving& serving) {
+bool offer(const DBusConnection& bus, Serving& serving) {
     const NodeInfoPtr node{g_dbus_node_info_new_for_xml(kInterface, nullptr)};
-    return g_dbus_connection_register_object(bus, kPath, node->interfaces[0], &kMembers, &serving, nullptr,
-                                             nullptr) != 0 &&
+    return g_dbus_connection_register_object(bus.get(), kPath, node->interfaces[0], &kMembers, &serving,
+                                             nullptr, nullptr) != 0 &&
            askBus(bus, "RequestName", g_variant_new("(su)", kName, kDoNotQueue)) == kIsOwner;
 }
 
 }  // namespace
 
 bool AgentService::run(std::chrono::milliseconds idleLimit) {
-    const GObjectPtr<GDBusConnection> bus{g_bus_get_sync(G_BUS_TYPE_SESSION, nullptr, nullptr)};
     Serving serving{agent_, idleLimit, Deadline::after(idleLimit)};
-    if (!bus)
+    const DBusConnection bus(Bus::Session, kBusLimit);
+    if (bus.get() == nullptr)
         return false;
-    g_dbus_connection_set_exit_on_close(bus.get(), FALSE);
     g_signal_connect(bus.get(), "closed", G_CALLBACK(onClosed), &serving);
-    if (!offer(bus.get(), serving))
+    if (!offer(bus, serving))
         return false;
     const auto tick = g_timeout_add(100, onTick, nullptr);
     while (!serving.busIsGone && !serving.idle.passed())
@@ -96,10 +95,11 @@ bool AgentService::run(std::chrono::milliseconds idleLimit) {
 
     // Whoever asks from here on is answered by a new process; who has asked already, by this one.
     if (!serving.busIsGone)
-        askBus(bus.get(), "ReleaseName", g_variant_new("(s)", kName));
+        askBus(bus, "ReleaseName", g_variant_new("(s)", kName));
     while (g_main_context_iteration(nullptr, FALSE) != FALSE) {
     }
-    g_dbus_connection_flush_sync(bus.get(), nullptr, nullptr);
+    const CancelAtDeadline cancel(Deadline::after(kBusLimit));
+    g_dbus_connection_flush_sync(bus.get(), cancel.get(), nullptr);
     return true;
 }
 

@@ -105,6 +105,14 @@ TEST_F(RunningAgentService, EndsWithTheBus) {
     EXPECT_TRUE(service.waitUntilEnded(20s));
 }
 
+TEST_F(RunningAgentService, EndsWhereTheBusHangs) {
+    bus_.suspend();
+    auto service = start("300");
+    EXPECT_TRUE(service.waitUntilEnded(25s));
+    EXPECT_EQ(service.result().exitStatus, 1) << service.standardError();
+    bus_.resume();
+}
+
 TEST_F(RunningAgentService, KnowsNoPackageWithoutACatalogue) {
     std::filesystem::remove(data_ / "driver-packages.plist");
     auto service = start("20000");
