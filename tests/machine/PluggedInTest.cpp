@@ -31,8 +31,8 @@ constexpr const char* kGoodEnd = "Deactivated successfully";
 
 class PluggedIn : public testing::Test {
 protected:
-    static bool ends(long more) {
-        return comesTrue([&] { return Machine::timesInJournal(kGoodEnd) >= more; }, kLimit);
+    static bool hasEnded(long times) {
+        return comesTrue([&] { return Machine::timesInJournal(kGoodEnd) >= times; }, kLimit);
     }
 
     void TearDown() override { EXPECT_THAT(Machine::failedUnits(), IsEmpty()) << Machine::journal(); }
@@ -42,7 +42,7 @@ protected:
 
 TEST_F(PluggedIn, PrinterHasAQueueThatPrints) {
     VhciPort port({.deviceID = kID});
-    ASSERT_TRUE(ends(endsBefore + 1)) << Machine::journal();
+    ASSERT_TRUE(hasEnded(endsBefore + 1)) << Machine::journal();
     const auto queue = Machine::queueOf(kURI);
     ASSERT_NE(queue, "") << Machine::journal();
     const auto lp = runProgram({"lp", "-d", queue, "/etc/hostname"});
@@ -53,7 +53,7 @@ TEST_F(PluggedIn, PrinterHasAQueueThatPrints) {
 TEST_F(PluggedIn, PrinterHasOneQueueHoweverOftenItComesBack) {
     for (int i = 1; i <= 2; ++i) {
         const VhciPort port({.deviceID = kID});
-        ASSERT_TRUE(ends(endsBefore + i)) << Machine::journal();
+        ASSERT_TRUE(hasEnded(endsBefore + i)) << Machine::journal();
     }
     EXPECT_EQ(Machine::queues().size(), 1U);
     EXPECT_NE(Machine::queueOf(kURI), "");
@@ -62,7 +62,7 @@ TEST_F(PluggedIn, PrinterHasOneQueueHoweverOftenItComesBack) {
 TEST_F(PluggedIn, PrinterWithoutADriverIsNoFailureOfAService) {
     const auto before = Machine::queues();
     const VhciPort port({.deviceID = "MFG:Acme;MDL:Winjet;CMD:GDI;SN:M2;"});
-    ASSERT_TRUE(ends(endsBefore + 1)) << Machine::journal();
+    ASSERT_TRUE(hasEnded(endsBefore + 1)) << Machine::journal();
     EXPECT_EQ(Machine::queues(), before);
 }
 
@@ -72,7 +72,7 @@ TEST_F(PluggedIn, PrinterIsThereBeforeThePackage) {
     const auto installed =
         runProgram({"sh", "-c", "dpkg --install /package/ventrasagent_*-1_*.deb"}, {}, kLimit);
     ASSERT_EQ(installed.exitStatus, 0) << installed.standardError;
-    ASSERT_TRUE(ends(endsBefore + 1)) << Machine::journal();
+    ASSERT_TRUE(hasEnded(endsBefore + 1)) << Machine::journal();
     EXPECT_NE(Machine::queueOf("usb://HP/HP%20LaserJet?serial=M4"), "") << Machine::journal();
 }
 
