@@ -9,6 +9,7 @@
 #include <mutex>
 #include <string>
 #include <thread>
+#include <utility>
 
 #include "fuzz/Require.h"
 #include "platform/IppConnection.h"
@@ -26,16 +27,17 @@ using namespace std::chrono_literals;
 /// A peer on a socket of the file system that says the same to everybody.
 class Speaker {
 public:
-    Speaker() : listener_(socket(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0)) {
+    explicit Speaker(std::string path)
+        : path_(std::move(path)), listener_(socket(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0)) {
         sockaddr_un address{};
         address.sun_family = AF_UNIX;
-        std::strncpy(address.sun_path, path().c_str(), sizeof address.sun_path - 1);
+        std::strncpy(address.sun_path, path_.c_str(), sizeof address.sun_path - 1);
         require(bind(listener_, reinterpret_cast<const sockaddr*>(&address), sizeof address) == 0);
         require(listen(listener_, 16) == 0);
         std::thread([this] { serve(); }).detach();
     }
 
-    std::string path() const { return folder_ / "peer"; }
+    const std::string& path() const { return path_; }
 
     void says(std::string answer) {
         const std::lock_guard lock(mutex_);
@@ -61,7 +63,7 @@ private:
         }
     }
 
-    TemporaryFolder folder_;
+    std::string path_;
     int listener_;
     std::mutex mutex_;
     std::string answer_;
@@ -76,7 +78,8 @@ IppPtr question() {
 }  // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
-    static Speaker& peer = *new Speaker;  // its thread lives as long as the process
+    static const TemporaryFolder folder;
+    static Speaker& peer = *new Speaker(folder / "peer");  // its thread lives as long as the process
     peer.says({reinterpret_cast<const char*>(data), size});
     auto connection = IppConnection::toPrinter(peer.path(), 0, HTTP_ENCRYPTION_NEVER, 200ms);
     require(connection.connected());
