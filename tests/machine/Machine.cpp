@@ -2,18 +2,23 @@
 
 #include <algorithm>
 #include <sstream>
+#include <string_view>
 
 #include "tests/parts/Program.h"
 
 namespace ventras::Machine {
 namespace {
 
-std::vector<std::string> linesOf(const std::vector<std::string>& command) {
+std::vector<std::string> linesIn(const std::string& text) {
     std::vector<std::string> lines;
-    std::istringstream output(runProgram(command).standardOutput);
-    for (std::string line; std::getline(output, line);)
+    std::istringstream stream(text);
+    for (std::string line; std::getline(stream, line);)
         lines.push_back(line);
     return lines;
+}
+
+std::vector<std::string> linesOf(const std::vector<std::string>& command) {
+    return linesIn(runProgram(command).standardOutput);
 }
 
 }  // namespace
@@ -44,11 +49,8 @@ std::string journal() {
 }
 
 long timesInJournal(const std::string& text) {
-    std::istringstream lines(journal());
-    long count = 0;
-    for (std::string line; std::getline(lines, line);)
-        count += line.find(text) != std::string::npos ? 1 : 0;
-    return count;
+    return std::ranges::count_if(
+        linesIn(journal()), [&](const std::string& line) { return line.find(text) != std::string::npos; });
 }
 
 std::vector<std::string> failedUnits() {

@@ -102,6 +102,13 @@ protected:
         return names;
     }
 
+    /// Prints, and expects as many documents to have come out by then.
+    void expectPrinted(const std::string& queue, std::size_t documents) const {
+        const auto lp = runProgram({"lp", "-d", queue, "/etc/hostname"});
+        EXPECT_EQ(lp.exitStatus, 0) << lp.standardError;
+        EXPECT_TRUE(inside.receivedWithin(kLimit, documents)) << inside.log() << Machine::journal();
+    }
+
     VirtualPrinter inside{{.name = "Inside", .make = "Acme", .model = "Laser"}};
 };
 
@@ -109,13 +116,10 @@ TEST_F(PluggedInWithIppOverUsb, PrinterHasAQueueThatPrintsAgainWhenItComesBack) 
     auto port = plugIn();
     ASSERT_TRUE(comesTrue([] { return !queues().empty(); }, kLimit)) << Machine::journal();
     const auto queue = queues().front();
-    for (std::size_t documents : {1U, 2U}) {
-        const auto lp = runProgram({"lp", "-d", queue, "/etc/hostname"});
-        EXPECT_EQ(lp.exitStatus, 0) << lp.standardError;
-        EXPECT_TRUE(inside.receivedWithin(kLimit, documents)) << inside.log() << Machine::journal();
-        port.reset();
-        port = plugIn();
-    }
+    expectPrinted(queue, 1);
+    port.reset();
+    port = plugIn();
+    expectPrinted(queue, 2);
     EXPECT_THAT(queues(), ElementsAre(queue));
 }
 
