@@ -10,6 +10,8 @@
 #include <chrono>
 #include <stdexcept>
 
+#include "platform/linux/ArgumentPointers.h"
+
 namespace ventras {
 namespace {
 
@@ -51,10 +53,8 @@ public:
 }  // namespace
 
 Cost timedRun(const std::vector<std::string>& arguments) {
-    std::vector<char*> list;
-    for (const auto& argument : arguments)
-        list.push_back(const_cast<char*>(argument.c_str()));
-    list.push_back(nullptr);
+    auto words = arguments;
+    const auto list = argumentPointers(words);
 
     Complaints complaints;
     const Outlets outlets(complaints.file());

@@ -4,13 +4,12 @@
 
 #include <unistd.h>
 
-#include <algorithm>
 #include <cstdio>
 #include <fstream>
-#include <iterator>
 #include <string>
 #include <vector>
 
+#include "platform/linux/ArgumentPointers.h"
 #include "platform/linux/usb/LibusbDevice.h"
 
 namespace {
@@ -55,9 +54,7 @@ int main(int argc, char* argv[]) {
             return 0;  // no printer, or gone already
         command.insert(command.end(), more.begin(), more.end());
     }
-    std::vector<char*> pointers;
-    std::ranges::transform(command, std::back_inserter(pointers), [](auto& text) { return text.data(); });
-    pointers.push_back(nullptr);
+    const auto pointers = argumentPointers(command);
     execv(pointers[0], pointers.data());
     std::perror(pointers[0]);
     return kCannotRun;

@@ -5,23 +5,20 @@
 #include <spawn.h>
 #include <unistd.h>
 
-#include <algorithm>
 #include <csignal>
 #include <cstdio>
 #include <cstring>
-#include <iterator>
 #include <string>
 #include <vector>
 
 #include "data/ippusb/PrinterWatch.h"
+#include "platform/linux/ArgumentPointers.h"
 
 namespace {
 
 void start(std::vector<std::string> command, const std::string& printer) {
     command.push_back("ippusb://" + printer);
-    std::vector<char*> pointers;
-    std::ranges::transform(command, std::back_inserter(pointers), [](auto& word) { return word.data(); });
-    pointers.push_back(nullptr);
+    const auto pointers = ventras::argumentPointers(command);
 
     sigset_t ignored;
     sigemptyset(&ignored);

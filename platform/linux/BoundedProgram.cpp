@@ -12,6 +12,7 @@
 #include <string_view>
 
 #include "platform/Deadline.h"
+#include "platform/linux/ArgumentPointers.h"
 #include "platform/linux/FileDescriptor.h"
 
 namespace ventras {
@@ -60,15 +61,6 @@ private:
     posix_spawn_file_actions_t actions_{};
     posix_spawnattr_t attributes_{};
 };
-
-/// Null-terminated, as exec wants it; the texts stay the caller's.
-std::vector<char*> pointersTo(std::vector<std::string>& texts) {
-    std::vector<char*> pointers;
-    for (auto& text : texts)
-        pointers.push_back(text.data());
-    pointers.push_back(nullptr);
-    return pointers;
-}
 
 std::vector<std::string> environmentWith(const std::map<std::string, std::string>& variables) {
     std::vector<std::string> environment;
@@ -122,8 +114,8 @@ std::optional<std::string> outputOf(const std::vector<std::string>& arguments,
         return std::nullopt;
     auto words = arguments;
     auto environment = environmentWith(variables);
-    auto wordPointers = pointersTo(words);
-    auto environmentPointers = pointersTo(environment);
+    auto wordPointers = argumentPointers(words);
+    auto environmentPointers = argumentPointers(environment);
     const auto deadline = Deadline::after(limit);
     const pid_t process = SpawnSettings(pipe->writing.get()).spawn(wordPointers, environmentPointers);
     if (process < 0)

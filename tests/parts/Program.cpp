@@ -16,6 +16,8 @@
 #include <csignal>
 #include <system_error>
 
+#include "platform/linux/ArgumentPointers.h"
+
 namespace ventras {
 namespace {
 
@@ -83,14 +85,6 @@ std::vector<std::string> completeEnvironment(const Environment& additions) {
     return list;
 }
 
-std::vector<char*> pointers(std::vector<std::string>& strings) {
-    std::vector<char*> list;
-    for (auto& string : strings)
-        list.push_back(string.data());
-    list.push_back(nullptr);
-    return list;
-}
-
 class SpawnSettings {
 public:
     SpawnSettings(const std::array<int, 3>& descriptors, const std::string& workingFolder) {
@@ -144,8 +138,9 @@ RunningProgram::RunningProgram(const std::vector<std::string>& arguments, const 
         environment["JOURNAL_STREAM"] = identityOf(error_);
     auto environmentStrings = completeEnvironment(environment);
     const SpawnSettings settings({input, output_, error_}, options.workingFolder);
-    const int failed = posix_spawnp(&pid_, "setpriv", &settings.actions, &settings.attributes,
-                                    pointers(argumentStrings).data(), pointers(environmentStrings).data());
+    const int failed =
+        posix_spawnp(&pid_, "setpriv", &settings.actions, &settings.attributes,
+                     argumentPointers(argumentStrings).data(), argumentPointers(environmentStrings).data());
     close(input);
     if (failed != 0)
         fail(failed, arguments.at(0));

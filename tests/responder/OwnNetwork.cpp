@@ -19,6 +19,7 @@
 #include <string>
 #include <vector>
 
+#include "platform/linux/ArgumentPointers.h"
 #include "tests/parts/Program.h"
 
 namespace ventras {
@@ -100,10 +101,7 @@ void runAnew(std::vector<std::string> command, char* arguments[]) {
     command.emplace_back(fs::read_symlink("/proc/self/exe"));
     for (char** argument = arguments + 1; *argument != nullptr; ++argument)
         command.emplace_back(*argument);
-    std::vector<char*> pointers;
-    for (auto& word : command)
-        pointers.push_back(word.data());
-    pointers.push_back(nullptr);
+    const auto pointers = argumentPointers(command);
     setenv(kMarker, "1", 1);
     execvp(pointers.front(), pointers.data());
     fail(command.front() + ": " + std::strerror(errno));

@@ -7,13 +7,12 @@
 
 #include <csignal>
 
+#include "platform/linux/ArgumentPointers.h"
+
 namespace ventras {
 
 ChildProgram::ChildProgram(EventContext& events, std::vector<std::string> arguments) : events_(events) {
-    std::vector<char*> words;
-    for (auto& argument : arguments)
-        words.push_back(argument.data());
-    words.push_back(nullptr);
+    auto words = argumentPointers(arguments);
     constexpr auto kFlags = static_cast<GSpawnFlags>(G_SPAWN_SEARCH_PATH | G_SPAWN_DO_NOT_REAP_CHILD |
                                                      G_SPAWN_STDOUT_TO_DEV_NULL | G_SPAWN_STDERR_TO_DEV_NULL);
     int input = -1;
